@@ -1074,6 +1074,234 @@ static_assert(offsetof(PF_OutData, dest_snd) == 368);
 static_assert(offsetof(PF_OutData, out_flags2) == 400);
 
 // ---------------------------------------------------------------------------------------------------
+// Arbitrary-data callbacks (extra of PF_Cmd_ARBITRARY_CALLBACK). Handles handed out through the `out`
+// members below belong to the caller.
+
+struct PF_ArbParamsExtra {
+  PF_FunctionSelector which_function;
+  A_short id;  // the arbitrary id given at add_param time
+  A_short padding;
+  union {
+    struct {
+      void* refconPV;
+      PF_ArbitraryH* arbPH;  // out
+    } new_func_params;
+    struct {
+      void* refconPV;
+      PF_ArbitraryH arbH;
+    } dispose_func_params;
+    struct {
+      void* refconPV;
+      PF_ArbitraryH src_arbH;
+      PF_ArbitraryH* dst_arbPH;  // out
+    } copy_func_params;
+    struct {
+      void* refconPV;
+      PF_ArbitraryH arbH;
+      A_u_long* flat_data_sizePLu;  // out
+    } flat_size_func_params;
+    struct {
+      void* refconPV;
+      PF_ArbitraryH arbH;
+      A_u_long buf_sizeLu;
+      void* flat_dataPV;  // allocated by the host, buf_sizeLu bytes
+    } flatten_func_params;
+    struct {
+      void* refconPV;
+      A_u_long buf_sizeLu;
+      const void* flat_dataPV;
+      PF_ArbitraryH* arbPH;  // out
+    } unflatten_func_params;
+    struct {
+      void* refconPV;
+      PF_ArbitraryH left_arbH;
+      PF_ArbitraryH right_arbH;
+      PF_FpLong tF;  // 0..1
+      PF_ArbitraryH* interpPH;  // out
+    } interp_func_params;
+    struct {
+      void* refconPV;
+      PF_ArbitraryH a_arbH;
+      PF_ArbitraryH b_arbH;
+      PF_ArbCompareResult* compareP;  // out
+    } compare_func_params;
+    struct {
+      void* refconPV;
+      PF_ArbitraryH arbH;
+      A_u_long* print_sizePLu;  // out
+    } print_size_func_params;
+    struct {
+      void* refconPV;
+      PF_ArbPrintFlags print_flags;
+      PF_ArbitraryH arbH;
+      A_u_long print_sizeLu;
+      A_char* print_bufferPC;
+    } print_func_params;
+    struct {
+      void* refconPV;
+      const A_char* bufPC;
+      A_u_long bytes_to_scanLu;
+      PF_ArbitraryH* arbPH;  // out
+    } scan_func_params;
+  } u;
+};
+
+#define VT_ARB_OFFSET(member, field) \
+  (offsetof(PF_ArbParamsExtra, u) + offsetof(decltype(PF_ArbParamsExtra::u.member), field))
+static_assert(sizeof(PF_ArbParamsExtra) == 48);
+static_assert(offsetof(PF_ArbParamsExtra, which_function) == 0);
+static_assert(offsetof(PF_ArbParamsExtra, id) == 4);
+static_assert(offsetof(PF_ArbParamsExtra, padding) == 6);
+static_assert(offsetof(PF_ArbParamsExtra, u) == 8);
+static_assert(VT_ARB_OFFSET(new_func_params, refconPV) == 8);
+static_assert(VT_ARB_OFFSET(new_func_params, arbPH) == 16);
+static_assert(VT_ARB_OFFSET(dispose_func_params, arbH) == 16);
+static_assert(VT_ARB_OFFSET(copy_func_params, src_arbH) == 16);
+static_assert(VT_ARB_OFFSET(copy_func_params, dst_arbPH) == 24);
+static_assert(VT_ARB_OFFSET(flat_size_func_params, arbH) == 16);
+static_assert(VT_ARB_OFFSET(flat_size_func_params, flat_data_sizePLu) == 24);
+static_assert(VT_ARB_OFFSET(flatten_func_params, arbH) == 16);
+static_assert(VT_ARB_OFFSET(flatten_func_params, buf_sizeLu) == 24);
+static_assert(VT_ARB_OFFSET(flatten_func_params, flat_dataPV) == 32);
+static_assert(VT_ARB_OFFSET(unflatten_func_params, buf_sizeLu) == 16);
+static_assert(VT_ARB_OFFSET(unflatten_func_params, flat_dataPV) == 24);
+static_assert(VT_ARB_OFFSET(unflatten_func_params, arbPH) == 32);
+static_assert(VT_ARB_OFFSET(interp_func_params, left_arbH) == 16);
+static_assert(VT_ARB_OFFSET(interp_func_params, right_arbH) == 24);
+static_assert(VT_ARB_OFFSET(interp_func_params, tF) == 32);
+static_assert(VT_ARB_OFFSET(interp_func_params, interpPH) == 40);
+static_assert(VT_ARB_OFFSET(compare_func_params, a_arbH) == 16);
+static_assert(VT_ARB_OFFSET(compare_func_params, b_arbH) == 24);
+static_assert(VT_ARB_OFFSET(compare_func_params, compareP) == 32);
+static_assert(VT_ARB_OFFSET(print_size_func_params, arbH) == 16);
+static_assert(VT_ARB_OFFSET(print_size_func_params, print_sizePLu) == 24);
+static_assert(VT_ARB_OFFSET(print_func_params, print_flags) == 16);
+static_assert(VT_ARB_OFFSET(print_func_params, arbH) == 24);
+static_assert(VT_ARB_OFFSET(print_func_params, print_sizeLu) == 32);
+static_assert(VT_ARB_OFFSET(print_func_params, print_bufferPC) == 40);
+static_assert(VT_ARB_OFFSET(scan_func_params, bufPC) == 16);
+static_assert(VT_ARB_OFFSET(scan_func_params, bytes_to_scanLu) == 24);
+static_assert(VT_ARB_OFFSET(scan_func_params, arbPH) == 32);
+#undef VT_ARB_OFFSET
+
+// ---------------------------------------------------------------------------------------------------
+// Smart render (extra of PF_Cmd_SMART_PRE_RENDER and PF_Cmd_SMART_RENDER). Newer hosts append fields to
+// the input records and to PF_PreRenderCallbacks; the module only reads the leading fields declared
+// here, so these records must never be allocated or copied whole on the module's side.
+
+struct PF_RenderRequest {
+  PF_LRect rect;
+  PF_Field field;
+  PF_ChannelMask channel_mask;
+  PF_Boolean preserve_rgb_of_zero_alpha;
+  A_char unused[3];
+  A_long reserved[4];
+};
+static_assert(sizeof(PF_RenderRequest) == 44);
+static_assert(offsetof(PF_RenderRequest, rect) == 0);
+static_assert(offsetof(PF_RenderRequest, field) == 16);
+static_assert(offsetof(PF_RenderRequest, channel_mask) == 20);
+static_assert(offsetof(PF_RenderRequest, preserve_rgb_of_zero_alpha) == 24);
+static_assert(offsetof(PF_RenderRequest, unused) == 25);
+static_assert(offsetof(PF_RenderRequest, reserved) == 28);
+
+struct PF_PreRenderInput {
+  PF_RenderRequest output_request;
+  A_short bitdepth;
+};
+static_assert(sizeof(PF_PreRenderInput) == 48);
+static_assert(offsetof(PF_PreRenderInput, output_request) == 0);
+static_assert(offsetof(PF_PreRenderInput, bitdepth) == 44);
+
+typedef void(SPAPI* PF_DeletePreRenderDataFunc)(void* pre_render_data);
+
+struct PF_PreRenderOutput {
+  PF_LRect result_rect;
+  PF_LRect max_result_rect;
+  PF_Boolean solid;
+  PF_Boolean reserved;
+  PF_RenderOutputFlags flags;
+  void* pre_render_data;
+  PF_DeletePreRenderDataFunc delete_pre_render_data_func;
+};
+static_assert(sizeof(PF_PreRenderOutput) == 56);
+static_assert(offsetof(PF_PreRenderOutput, result_rect) == 0);
+static_assert(offsetof(PF_PreRenderOutput, max_result_rect) == 16);
+static_assert(offsetof(PF_PreRenderOutput, solid) == 32);
+static_assert(offsetof(PF_PreRenderOutput, reserved) == 33);
+static_assert(offsetof(PF_PreRenderOutput, flags) == 34);
+static_assert(offsetof(PF_PreRenderOutput, pre_render_data) == 40);
+static_assert(offsetof(PF_PreRenderOutput, delete_pre_render_data_func) == 48);
+
+struct PF_CheckoutResult {
+  PF_LRect result_rect;
+  PF_LRect max_result_rect;
+  PF_RationalScale par;
+  PF_Boolean solid;
+  PF_Boolean reservedB[3];
+  A_long ref_width;
+  A_long ref_height;
+  A_long reserved[6];
+};
+static_assert(sizeof(PF_CheckoutResult) == 76);
+static_assert(offsetof(PF_CheckoutResult, result_rect) == 0);
+static_assert(offsetof(PF_CheckoutResult, max_result_rect) == 16);
+static_assert(offsetof(PF_CheckoutResult, par) == 32);
+static_assert(offsetof(PF_CheckoutResult, solid) == 40);
+static_assert(offsetof(PF_CheckoutResult, reservedB) == 41);
+static_assert(offsetof(PF_CheckoutResult, ref_width) == 44);
+static_assert(offsetof(PF_CheckoutResult, ref_height) == 48);
+static_assert(offsetof(PF_CheckoutResult, reserved) == 52);
+
+struct PF_PreRenderCallbacks {
+  // index 0 is the input layer; checkout_idL is the module's own non-negative, unique id.
+  PF_Err(SPAPI* checkout_layer)(PF_ProgPtr effect_ref, PF_ParamIndex index, A_long checkout_idL,
+                                const PF_RenderRequest* req, A_long what_time, A_long time_step,
+                                A_u_long time_scale, PF_CheckoutResult* checkout_result);
+};
+static_assert(sizeof(PF_PreRenderCallbacks) == 8);
+static_assert(offsetof(PF_PreRenderCallbacks, checkout_layer) == 0);
+
+struct PF_PreRenderExtra {
+  PF_PreRenderInput* input;
+  PF_PreRenderOutput* output;
+  PF_PreRenderCallbacks* cb;
+};
+static_assert(sizeof(PF_PreRenderExtra) == 24);
+static_assert(offsetof(PF_PreRenderExtra, input) == 0);
+static_assert(offsetof(PF_PreRenderExtra, output) == 8);
+static_assert(offsetof(PF_PreRenderExtra, cb) == 16);
+
+struct PF_SmartRenderInput {
+  PF_RenderRequest output_request;
+  A_short bitdepth;
+  void* pre_render_data;
+};
+static_assert(sizeof(PF_SmartRenderInput) == 56);
+static_assert(offsetof(PF_SmartRenderInput, output_request) == 0);
+static_assert(offsetof(PF_SmartRenderInput, bitdepth) == 44);
+static_assert(offsetof(PF_SmartRenderInput, pre_render_data) == 48);
+
+struct PF_SmartRenderCallbacks {
+  PF_Err(SPAPI* checkout_layer_pixels)(PF_ProgPtr effect_ref, A_long checkout_idL,
+                                       PF_EffectWorld** pixels);
+  PF_Err(SPAPI* checkin_layer_pixels)(PF_ProgPtr effect_ref, A_long checkout_idL);
+  PF_Err(SPAPI* checkout_output)(PF_ProgPtr effect_ref, PF_EffectWorld** output);
+};
+static_assert(sizeof(PF_SmartRenderCallbacks) == 24);
+static_assert(offsetof(PF_SmartRenderCallbacks, checkout_layer_pixels) == 0);
+static_assert(offsetof(PF_SmartRenderCallbacks, checkin_layer_pixels) == 8);
+static_assert(offsetof(PF_SmartRenderCallbacks, checkout_output) == 16);
+
+struct PF_SmartRenderExtra {
+  PF_SmartRenderInput* input;
+  PF_SmartRenderCallbacks* cb;
+};
+static_assert(sizeof(PF_SmartRenderExtra) == 16);
+static_assert(offsetof(PF_SmartRenderExtra, input) == 0);
+static_assert(offsetof(PF_SmartRenderExtra, cb) == 8);
+
+// ---------------------------------------------------------------------------------------------------
 // The entry point. Exported with C linkage under the name the property list's '8664' entry gives.
 
 typedef PF_Err(SPAPI* PF_FilterProc)(PF_Cmd cmd, PF_InData* in_data, PF_OutData* out_data,
