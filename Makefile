@@ -1,0 +1,51 @@
+# Set-up, build and test on a fresh Debian 12 machine. See README.md.
+SHELL := /bin/bash
+JOBS ?= $(shell nproc)
+BUILD ?= build
+ASAN_BUILD ?= build-asan
+WIN_BUILD ?= build-win
+CMAKE_FLAGS ?=
+
+.PHONY: all deps build demo test test-plain test-asan windows test-windows fuzz bench clean
+
+all: build
+
+deps:
+	@bash scripts/deps.sh native
+
+$(BUILD)/build.ninja:
+	cmake -S . -B $(BUILD) -G Ninja -DCMAKE_BUILD_TYPE=RelWithDebInfo -DVT_WERROR=ON $(CMAKE_FLAGS)
+
+build: deps $(BUILD)/build.ninja
+	cmake --build $(BUILD) -j $(JOBS)
+
+$(ASAN_BUILD)/build.ninja:
+	cmake -S . -B $(ASAN_BUILD) -G Ninja -DCMAKE_BUILD_TYPE=Debug -DVT_WERROR=ON -DVT_SANITIZE=ON -DVT_BUILD_BENCH=OFF $(CMAKE_FLAGS)
+
+demo: build
+	@bash scripts/demo.sh $(BUILD)
+
+test-plain: build
+	ctest --test-dir $(BUILD) --output-on-failure -j $(JOBS)
+
+test-asan: deps $(ASAN_BUILD)/build.ninja
+	cmake --build $(ASAN_BUILD) -j $(JOBS)
+	ASAN_OPTIONS=detect_leaks=1 UBSAN_OPTIONS=print_stacktrace=1 ctest --test-dir $(ASAN_BUILD) --output-on-failure -j $(JOBS)
+
+test: test-plain test-asan
+
+$(WIN_BUILD)/build.ninja:
+	@bash scripts/deps.sh windows
+	cmake -S . -B $(WIN_BUILD) -G Ninja -DCMAKE_TOOLCHAIN_FILE=cmake/mingw-w64.cmake -DCMAKE_BUILD_TYPE=Release -DVT_WERROR=ON -DVT_BUILD_BENCH=OFF $(CMAKE_FLAGS)
+
+windows: $(WIN_BUILD)/build.ninja
+	cmake --build $(WIN_BUILD) -j $(JOBS)
+
+test-windows: windows
+	bash scripts/wine-test.sh $(WIN_BUILD)
+
+bench: build
+	@for b in $(BUILD)/bench/*_bench; do echo "== $$b"; $$b; done
+
+clean:
+	rm -rf $(BUILD) $(ASAN_BUILD) $(WIN_BUILD)

@@ -1,0 +1,7 @@
+#include "host/processor_dispatch.h"
+
+namespace vt {
+
+void InitProcessorDispatch() {}
+
+}  // namespace vt

@@ -1,0 +1,25 @@
+// The one hook the POSIX build of the module exports besides its entry point: the hosting process
+// installs sinks for message boxes, debugger output and the about box, and may present another
+// process identity (command line and executable path) to the module's host identification.
+// Plain C so that a host loading the module with dlopen can call it.
+#pragma once
+
+#include <stdint.h>
+
+extern "C" {
+
+struct VtPlatformHooks {
+    uint32_t size;  // sizeof(VtPlatformHooks), for later growth
+    void* context;
+    void (*message)(void* context, const char* text, int kind);  // null: print to standard error
+    void (*debug)(void* context, const char* line);              // null: standard error when VELATONE_DEBUG is set
+    void (*about)(void* context, void* owner);                   // null: nothing is shown
+    const char* commandLine;     // null: the real command line
+    const char* executablePath;  // null: the real executable
+};
+
+// Name of the exported function, for dlsym.
+#define VT_PLATFORM_HOOKS_SYMBOL "VelatoneInstallPlatformHooks"
+typedef void (*VtInstallPlatformHooksProc)(const VtPlatformHooks* hooks);
+
+}  // extern "C"

@@ -1,0 +1,374 @@
+#include "refhost/host.h"
+
+#include <cstdio>
+#include <cstring>
+
+#include "sdk/ae_suites.h"
+
+namespace refhost {
+
+namespace {
+
+Host* g_current = nullptr;  // the host the module's C callbacks reach
+
+Host& Current() { return *g_current; }
+
+// ---- utility callbacks: host memory handles
+
+PF_Handle HostNewHandle(A_u_longlong size) { return Current().heap().New(static_cast<size_t>(size)); }
+void* HostLockHandle(PF_Handle handle) { return Current().heap().Lock(handle); }
+void HostUnlockHandle(PF_Handle handle) { Current().heap().Unlock(handle); }
+void HostDisposeHandle(PF_Handle handle) { Current().heap().Dispose(handle); }
+A_u_longlong HostGetHandleSize(PF_Handle handle) { return Current().heap().Size(handle); }
+PF_Err HostResizeHandle(A_u_longlong size, PF_Handle* handle) {
+    if (!handle) return PF_Err_BAD_CALLBACK_PARAM;
+    return Current().heap().Resize(*handle, static_cast<size_t>(size)) ? PF_Err_NONE : PF_Err_OUT_OF_MEMORY;
+}
+
+// ---- the suite directory
+
+SPErr BasicAcquireSuite(const char* name, int32_t version, const void** suite) {
+    return Current().AcquireSuite(name, version, suite);
+}
+SPErr BasicReleaseSuite(const char* name, int32_t version) { return Current().ReleaseSuite(name, version); }
+SPBoolean BasicIsEqual(const char* a, const char* b) { return a && b && std::strcmp(a, b) == 0; }
+SPErr BasicAllocateBlock(size_t size, void** block) {
+    *block = std::malloc(size);
+    return *block ? kSPNoError : 1;
+}
+SPErr BasicFreeBlock(void* block) {
+    std::free(block);
+    return kSPNoError;
+}
+SPErr BasicReallocateBlock(void* block, size_t size, void** newBlock) {
+    *newBlock = std::realloc(block, size);
+    return *newBlock ? kSPNoError : 1;
+}
+SPErr BasicUndefined() { return kSPNoError; }
+
+// ---- "AEGP Utility Suite"
+
+A_Err RegisterWithAEGP(AEGP_GlobalRefcon, const A_char* name, AEGP_PluginID* id) {
+    Current().Register(name, id);
+    return 0;
+}
+
+AEGP_UtilitySuite5 MakeUtilitySuite() {
+    AEGP_UtilitySuite5 suite{};
+    suite.AEGP_RegisterWithAEGP = RegisterWithAEGP;
+    return suite;
+}
+
+// ---- "AEGP Memory Suite": the same handles as the utility callbacks, with an allocation name
+
+A_Err NewMemHandle(AEGP_PluginID, const A_char* what, AEGP_MemSize size, AEGP_MemFlag flags, AEGP_MemHandle* handle) {
+    void** h = Current().heap().New(size, what);
+    if (!h) return PF_Err_OUT_OF_MEMORY;
+    if (flags & AEGP_MemFlag_CLEAR) std::memset(*h, 0, size);
+    *handle = reinterpret_cast<AEGP_MemHandle>(h);
+    return 0;
+}
+A_Err FreeMemHandle(AEGP_MemHandle handle) {
+    Current().heap().Dispose(reinterpret_cast<void**>(handle));
+    return 0;
+}
+A_Err LockMemHandle(AEGP_MemHandle handle, void** pointer) {
+    *pointer = Current().heap().Lock(reinterpret_cast<void**>(handle));
+    return *pointer ? 0 : PF_Err_BAD_CALLBACK_PARAM;
+}
+A_Err UnlockMemHandle(AEGP_MemHandle handle) {
+    Current().heap().Unlock(reinterpret_cast<void**>(handle));
+    return 0;
+}
+A_Err GetMemHandleSize(AEGP_MemHandle handle, AEGP_MemSize* size) {
+    *size = static_cast<AEGP_MemSize>(Current().heap().Size(reinterpret_cast<void**>(handle)));
+    return 0;
+}
+
+AEGP_MemorySuite1 MakeMemorySuite() {
+    AEGP_MemorySuite1 suite{};
+    suite.AEGP_NewMemHandle = NewMemHandle;
+    suite.AEGP_FreeMemHandle = FreeMemHandle;
+    suite.AEGP_LockMemHandle = LockMemHandle;
+    suite.AEGP_UnlockMemHandle = UnlockMemHandle;
+    suite.AEGP_GetMemHandleSize = GetMemHandleSize;
+    return suite;
+}
+
+// ---- "PF World Suite" version 2
+
+PF_Err WorldGetPixelFormat(const PF_EffectWorld* world, PF_PixelFormat* format) {
+    if (!world || !format) return PF_Err_BAD_CALLBACK_PARAM;
+    *format = (world->world_flags & PF_WorldFlag_DEEP) ? PF_PixelFormat_ARGB64 : PF_PixelFormat_ARGB32;
+    return PF_Err_NONE;
+}
+
+PF_WorldSuite2 MakeWorldSuite() {
+    PF_WorldSuite2 suite{};
+    suite.PF_GetPixelFormat = WorldGetPixelFormat;
+    return suite;
+}
+
+// ---- "PF Pixel Format Suite" version 1
+
+PF_Err AddSupportedPixelFormat(PF_ProgPtr, PrPixelFormat format) {
+    Current().AddPixelFormat(format);
+    return PF_Err_NONE;
+}
+PF_Err ClearSupportedPixelFormats(PF_ProgPtr) {
+    Current().ClearPixelFormats();
+    return PF_Err_NONE;
+}
+PF_Err PixelFormatGetPixelFormat(PF_EffectWorld* world, PrPixelFormat* format) {
+    if (!world || !format) return PF_Err_BAD_CALLBACK_PARAM;
+    *format = PrPixelFormat_BGRA_4444_8u;
+    return PF_Err_NONE;
+}
+
+PF_PixelFormatSuite1 MakePixelFormatSuite() {
+    PF_PixelFormatSuite1 suite{};
+    suite.AddSupportedPixelFormat = AddSupportedPixelFormat;
+    suite.ClearSupportedPixelFormats = ClearSupportedPixelFormats;
+    suite.GetPixelFormat = PixelFormatGetPixelFormat;
+    return suite;
+}
+
+// ---- "PF AE App Suite" version 6: the panel colours
+
+PF_Err AppGetBgColor(PF_App_Color* color) {
+    uint16_t background[3];
+    uint16_t text[3];
+    Current().AppColors(background, text);
+    *color = {background[0], background[1], background[2]};
+    return PF_Err_NONE;
+}
+PF_Err AppGetColor(PF_App_ColorType type, PF_App_Color* color) {
+    uint16_t background[3];
+    uint16_t text[3];
+    Current().AppColors(background, text);
+    *color = type == PF_App_Color_TEXT ? PF_App_Color{text[0], text[1], text[2]}
+                                       : PF_App_Color{background[0], background[1], background[2]};
+    return PF_Err_NONE;
+}
+
+PFAppSuite4 MakeAppSuite() {
+    PFAppSuite4 suite{};
+    suite.PF_AppGetBgColor = AppGetBgColor;
+    suite.PF_AppGetColor = AppGetColor;
+    return suite;
+}
+
+const AEGP_UtilitySuite5 kUtilitySuite = MakeUtilitySuite();
+const AEGP_MemorySuite1 kMemorySuite = MakeMemorySuite();
+const PF_WorldSuite2 kWorldSuite = MakeWorldSuite();
+const PF_PixelFormatSuite1 kPixelFormatSuite = MakePixelFormatSuite();
+const PFAppSuite4 kAppSuite = MakeAppSuite();
+
+std::string SuiteKey(const char* name, int32_t version) { return std::string(name) + "/" + std::to_string(version); }
+
+void HookMessage(void*, const char* text, int kind) { Current().RecordMessage(text, kind); }
+void HookDebug(void*, const char* line) { Current().RecordDebug(line); }
+void HookAbout(void*, void*) { Current().RecordAbout(); }
+
+}  // namespace
+
+Host* Host::Current() { return g_current; }
+
+Host::Host(HostPersona persona) : m_persona(std::move(persona)) {
+    g_current = this;
+    m_basic.AcquireSuite = BasicAcquireSuite;
+    m_basic.ReleaseSuite = BasicReleaseSuite;
+    m_basic.IsEqual = BasicIsEqual;
+    m_basic.AllocateBlock = BasicAllocateBlock;
+    m_basic.FreeBlock = BasicFreeBlock;
+    m_basic.ReallocateBlock = BasicReallocateBlock;
+    m_basic.Undefined = BasicUndefined;
+    m_utils.host_new_handle = HostNewHandle;
+    m_utils.host_lock_handle = HostLockHandle;
+    m_utils.host_unlock_handle = HostUnlockHandle;
+    m_utils.host_dispose_handle = HostDisposeHandle;
+    m_utils.host_get_handle_size = HostGetHandleSize;
+    m_utils.host_resize_handle = HostResizeHandle;
+    InitInData();
+}
+
+Host::~Host() {
+    UnloadModule();
+    if (g_current == this) g_current = nullptr;
+}
+
+void Host::InitInData() {
+    m_inData = PF_InData{};
+    m_inData.utils = &m_utils;
+    m_inData.effect_ref = reinterpret_cast<PF_ProgPtr>(this);
+    m_inData.quality = PF_Quality_HI;
+    m_inData.version.major = m_persona.apiMajor;
+    m_inData.version.minor = m_persona.apiMinor;
+    m_inData.appl_id = m_persona.applId;
+    m_inData.time_scale = 24;
+    m_inData.time_step = 1;
+    m_inData.local_time_step = 1;
+    m_inData.total_time = 240;
+    m_inData.downsample_x = {1, 1};
+    m_inData.downsample_y = {1, 1};
+    m_inData.pixel_aspect_ratio = {1, 1};
+    m_inData.pica_basicP = &m_basic;
+}
+
+bool Host::LoadModule(const std::string& path, std::string* error) {
+    UnloadModule();
+    std::vector<uint8_t> bytes;
+    if (!ReadModulePropertyList(path, &bytes, error)) return false;
+    std::vector<PiplEntry> entries;
+    if (!DecodePropertyList(bytes, &entries, error)) return false;
+    std::string entryName;
+    for (const PiplEntry& entry : entries) {
+        if (entry.key == "8664") entryName.assign(reinterpret_cast<const char*>(entry.data.data()),
+                                                  strnlen(reinterpret_cast<const char*>(entry.data.data()), entry.data.size()));
+    }
+    if (entryName.empty()) {
+        *error = path + ": the property list names no 64-bit entry point";
+        return false;
+    }
+    if (!m_library.Open(path, error)) return false;
+    m_entry = reinterpret_cast<PF_FilterProc>(m_library.Symbol(entryName.c_str()));
+    if (!m_entry) {
+        *error = path + " does not export " + entryName;
+        m_library.Close();
+        return false;
+    }
+    m_modulePath = path;
+    m_properties = std::move(entries);
+    m_entryPointName = entryName;
+    InstallPlatformHooks();
+    return true;
+}
+
+void Host::UnloadModule() {
+    m_entry = nullptr;
+    m_library.Close();
+    m_properties.clear();
+    m_entryPointName.clear();
+}
+
+void Host::InstallPlatformHooks() {
+    ModuleSinks sinks{};
+    sinks.context = this;
+    sinks.message = HookMessage;
+    sinks.debug = HookDebug;
+    sinks.about = HookAbout;
+    sinks.commandLine = m_persona.commandLine.c_str();
+    sinks.executablePath = m_persona.executablePath.c_str();
+    InstallModuleSinks(m_library, sinks);
+}
+
+PF_Err Host::Call(PF_Cmd cmd, PF_ParamDef** params, PF_LayerDef* output, void* extra) {
+    g_current = this;
+    if (!m_entry) return PF_Err_INVALID_CALLBACK;
+    return m_entry(cmd, &m_inData, &m_outData, params, output, extra);
+}
+
+PF_Err Host::GlobalSetup() {
+    m_outData = PF_OutData{};
+    const PF_Err err = Call(PF_Cmd_GLOBAL_SETUP);
+    m_inData.global_data = err == PF_Err_NONE ? m_outData.global_data : nullptr;
+    return err;
+}
+
+PF_Err Host::GlobalSetdown() {
+    const PF_Err err = Call(PF_Cmd_GLOBAL_SETDOWN);
+    m_inData.global_data = nullptr;
+    return err;
+}
+
+bool Host::SuiteOffered(const std::string& name, int32_t version) const {
+    const std::string key = name + "/" + std::to_string(version);
+    if (auto found = m_suiteOverrides.find(key); found != m_suiteOverrides.end()) return found->second;
+    if (name == kAEGPUtilitySuite && version == kAEGPUtilitySuiteVersion5) return m_persona.utilitySuite;
+    if (name == kAEGPMemorySuite && version == kAEGPMemorySuiteVersion1) return m_persona.memorySuite;
+    if (name == kPFWorldSuite && version == kPFWorldSuiteVersion2) return m_persona.worldSuite2;
+    if (name == kPFPixelFormatSuite && version == kPFPixelFormatSuiteVersion1) return m_persona.pixelFormatSuite;
+    if (name == kPFAppSuite && version == kPFAppSuiteVersion4) return m_persona.appSuite;
+    return false;
+}
+
+void Host::SetSuiteOffered(const std::string& name, int32_t version, bool offered) {
+    m_suiteOverrides[name + "/" + std::to_string(version)] = offered;
+}
+
+SPErr Host::AcquireSuite(const char* name, int32_t version, const void** suite) {
+    if (!name || !suite) return 1;
+    *suite = nullptr;
+    const std::string suiteName(name);
+    if (!SuiteOffered(suiteName, version)) return 1;
+    if (suiteName == kAEGPUtilitySuite) *suite = &kUtilitySuite;
+    else if (suiteName == kAEGPMemorySuite) *suite = &kMemorySuite;
+    else if (suiteName == kPFWorldSuite) *suite = &kWorldSuite;
+    else if (suiteName == kPFPixelFormatSuite) *suite = &kPixelFormatSuite;
+    else if (suiteName == kPFAppSuite) *suite = &kAppSuite;
+    if (!*suite) return 1;
+    std::lock_guard<std::mutex> guard(m_recordMutex);
+    ++m_outstanding[SuiteKey(name, version)];
+    ++m_suiteAcquisitions;
+    return kSPNoError;
+}
+
+SPErr Host::ReleaseSuite(const char* name, int32_t version) {
+    if (!name) return 1;
+    std::lock_guard<std::mutex> guard(m_recordMutex);
+    auto found = m_outstanding.find(SuiteKey(name, version));
+    if (found == m_outstanding.end() || found->second == 0) return 1;
+    if (--found->second == 0) m_outstanding.erase(found);
+    return kSPNoError;
+}
+
+std::map<std::string, int> Host::outstandingSuites() const {
+    std::lock_guard<std::mutex> guard(m_recordMutex);
+    return m_outstanding;
+}
+
+void Host::RecordMessage(const char* text, int kind) {
+    {
+        std::lock_guard<std::mutex> guard(m_recordMutex);
+        m_messages.push_back({kind, text ? text : ""});
+    }
+    if (!m_echoMessages) return;
+    const char* label = kind == 1 ? "warning" : kind == 2 ? "error" : kind == 3 ? "info" : "message";
+    std::fprintf(stderr, "%s: %s\n", label, text ? text : "");
+}
+
+void Host::RecordDebug(const char* line) {
+    std::lock_guard<std::mutex> guard(m_recordMutex);
+    m_debugLines.emplace_back(line ? line : "");
+}
+
+std::vector<Message> Host::messages() const {
+    std::lock_guard<std::mutex> guard(m_recordMutex);
+    return m_messages;
+}
+
+std::vector<std::string> Host::debugLines() const {
+    std::lock_guard<std::mutex> guard(m_recordMutex);
+    return m_debugLines;
+}
+
+void Host::ClearRecords() {
+    std::lock_guard<std::mutex> guard(m_recordMutex);
+    m_messages.clear();
+    m_debugLines.clear();
+}
+
+void Host::Register(const char* name, int32_t* id) {
+    m_registeredName = name ? name : "";
+    m_pluginId = 7;  // any non-zero identifier the host chooses
+    if (id) *id = m_pluginId;
+}
+
+void Host::AppColors(uint16_t* background, uint16_t* text) const {
+    for (int i = 0; i < 3; ++i) {
+        background[i] = m_persona.background[i];
+        text[i] = m_persona.text[i];
+    }
+}
+
+}  // namespace refhost
