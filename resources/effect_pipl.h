@@ -29,15 +29,14 @@ constexpr uint32_t kEffectReservedInfo = 8;
 
 constexpr PF_OutFlags kEffectGlobalOutFlags =
     PF_OutFlag_KEEP_RESOURCE_OPEN | PF_OutFlag_SEQUENCE_DATA_NEEDS_FLATTENING | PF_OutFlag_I_DO_DIALOG |
-    PF_OutFlag_USE_OUTPUT_EXTENT | PF_OutFlag_PIX_INDEPENDENT | PF_OutFlag_CUSTOM_UI |
-    PF_OutFlag_DEEP_COLOR_AWARE;
+    PF_OutFlag_USE_OUTPUT_EXTENT | PF_OutFlag_PIX_INDEPENDENT | PF_OutFlag_CUSTOM_UI | PF_OutFlag_DEEP_COLOR_AWARE;
 static_assert(kEffectGlobalOutFlags == 0x02008471);
 
 // What global setup declares on a host with smart render (API 12.10 and later), which is every
 // current host; older hosts are told only the query-dynamic-flags and collapsed-group bits.
-constexpr PF_OutFlags2 kEffectGlobalOutFlags2 =
-    PF_OutFlag2_SUPPORTS_QUERY_DYNAMIC_FLAGS | PF_OutFlag2_PARAM_GROUP_START_COLLAPSED_FLAG |
-    PF_OutFlag2_SUPPORTS_SMART_RENDER | PF_OutFlag2_FLOAT_COLOR_AWARE;
+constexpr PF_OutFlags2 kEffectGlobalOutFlags2 = PF_OutFlag2_SUPPORTS_QUERY_DYNAMIC_FLAGS |
+                                                PF_OutFlag2_PARAM_GROUP_START_COLLAPSED_FLAG |
+                                                PF_OutFlag2_SUPPORTS_SMART_RENDER | PF_OutFlag2_FLOAT_COLOR_AWARE;
 static_assert(kEffectGlobalOutFlags2 == 0x00001409);
 
 // In this order; the host reads the list before it loads the code.

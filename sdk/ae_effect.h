@@ -406,10 +406,9 @@ constexpr PF_App_ColorType PF_App_Color_SHADOW = 6;
 
 // Effect version word: build 0..8, stage 9..10, bug-fix 11..14, sub-version 15..18, version 19..21,
 // and the version's higher bits at 26..29.
-constexpr A_u_long PF_Version(A_u_long vers, A_u_long subvers, A_u_long bugvers, A_u_long stage,
-                              A_u_long build) {
-  return ((vers >> 3) & 0xF) << 26 | (vers & 0x7) << 19 | (subvers & 0xF) << 15 |
-         (bugvers & 0xF) << 11 | (stage & 0x3) << 9 | (build & 0x1FF);
+constexpr A_u_long PF_Version(A_u_long vers, A_u_long subvers, A_u_long bugvers, A_u_long stage, A_u_long build) {
+    return ((vers >> 3) & 0xF) << 26 | (vers & 0x7) << 19 | (subvers & 0xF) << 15 | (bugvers & 0xF) << 11 |
+           (stage & 0x3) << 9 | (build & 0x1FF);
 }
 
 // ---------------------------------------------------------------------------------------------------
@@ -417,10 +416,9 @@ constexpr A_u_long PF_Version(A_u_long vers, A_u_long subvers, A_u_long bugvers,
 // bytes in little-endian memory spell the letters in order (unlike a compiler multi-character literal).
 
 constexpr A_long PF_MakePixelFormatFourcc(char c0, char c1, char c2, char c3) {
-  return static_cast<A_long>(static_cast<uint32_t>(static_cast<uint8_t>(c0)) |
-                             static_cast<uint32_t>(static_cast<uint8_t>(c1)) << 8 |
-                             static_cast<uint32_t>(static_cast<uint8_t>(c2)) << 16 |
-                             static_cast<uint32_t>(static_cast<uint8_t>(c3)) << 24);
+    return static_cast<A_long>(
+        static_cast<uint32_t>(static_cast<uint8_t>(c0)) | static_cast<uint32_t>(static_cast<uint8_t>(c1)) << 8 |
+        static_cast<uint32_t>(static_cast<uint8_t>(c2)) << 16 | static_cast<uint32_t>(static_cast<uint8_t>(c3)) << 24);
 }
 
 constexpr PF_PixelFormat PF_PixelFormat_ARGB32 = PF_MakePixelFormatFourcc('a', 'r', 'g', 'b');
@@ -453,17 +451,17 @@ static_assert(PrPixelFormat_ARGB_4444_32f == 0x62675241);
 // Small records.
 
 struct PF_Point {
-  A_long h;  // x
-  A_long v;  // y
+    A_long h;  // x
+    A_long v;  // y
 };
 static_assert(sizeof(PF_Point) == 8);
 static_assert(offsetof(PF_Point, h) == 0 && offsetof(PF_Point, v) == 4);
 
 struct PF_LRect {
-  A_long left;
-  A_long top;
-  A_long right;
-  A_long bottom;
+    A_long left;
+    A_long top;
+    A_long right;
+    A_long bottom;
 };
 typedef PF_LRect PF_Rect;
 typedef PF_LRect PF_UnionableRect;
@@ -472,24 +470,24 @@ static_assert(offsetof(PF_LRect, left) == 0 && offsetof(PF_LRect, top) == 4);
 static_assert(offsetof(PF_LRect, right) == 8 && offsetof(PF_LRect, bottom) == 12);
 
 struct PF_RationalScale {
-  A_long num;
-  A_u_long den;
+    A_long num;
+    A_u_long den;
 };
 static_assert(sizeof(PF_RationalScale) == 8);
 static_assert(offsetof(PF_RationalScale, num) == 0 && offsetof(PF_RationalScale, den) == 4);
 
 struct PF_SpecVersion {
-  A_short major;
-  A_short minor;
+    A_short major;
+    A_short minor;
 };
 static_assert(sizeof(PF_SpecVersion) == 4);
 static_assert(offsetof(PF_SpecVersion, major) == 0 && offsetof(PF_SpecVersion, minor) == 2);
 
 struct PF_Pixel {
-  A_u_char alpha;
-  A_u_char red;
-  A_u_char green;
-  A_u_char blue;
+    A_u_char alpha;
+    A_u_char red;
+    A_u_char green;
+    A_u_char blue;
 };
 typedef PF_Pixel PF_Pixel8;
 typedef PF_Pixel* PF_PixelPtr;
@@ -498,20 +496,20 @@ static_assert(offsetof(PF_Pixel, alpha) == 0 && offsetof(PF_Pixel, red) == 1);
 static_assert(offsetof(PF_Pixel, green) == 2 && offsetof(PF_Pixel, blue) == 3);
 
 struct PF_Pixel16 {
-  A_u_short alpha;
-  A_u_short red;
-  A_u_short green;
-  A_u_short blue;
+    A_u_short alpha;
+    A_u_short red;
+    A_u_short green;
+    A_u_short blue;
 };
 static_assert(sizeof(PF_Pixel16) == 8);
 static_assert(offsetof(PF_Pixel16, alpha) == 0 && offsetof(PF_Pixel16, red) == 2);
 static_assert(offsetof(PF_Pixel16, green) == 4 && offsetof(PF_Pixel16, blue) == 6);
 
 struct PF_PixelFloat {
-  PF_FpShort alpha;
-  PF_FpShort red;
-  PF_FpShort green;
-  PF_FpShort blue;
+    PF_FpShort alpha;
+    PF_FpShort red;
+    PF_FpShort green;
+    PF_FpShort blue;
 };
 typedef PF_PixelFloat PF_Pixel32;
 static_assert(sizeof(PF_PixelFloat) == 16);
@@ -519,19 +517,19 @@ static_assert(offsetof(PF_PixelFloat, alpha) == 0 && offsetof(PF_PixelFloat, red
 static_assert(offsetof(PF_PixelFloat, green) == 8 && offsetof(PF_PixelFloat, blue) == 12);
 
 struct PF_App_Color {
-  A_u_short red;
-  A_u_short green;
-  A_u_short blue;
+    A_u_short red;
+    A_u_short green;
+    A_u_short blue;
 };
 static_assert(sizeof(PF_App_Color) == 6);
 static_assert(offsetof(PF_App_Color, red) == 0 && offsetof(PF_App_Color, green) == 2);
 static_assert(offsetof(PF_App_Color, blue) == 4);
 
 struct PF_SoundFormatInfo {
-  PF_FpLong rateF;
-  A_short num_channels;
-  A_short format;
-  A_short sample_size;
+    PF_FpLong rateF;
+    A_short num_channels;
+    A_short format;
+    A_short sample_size;
 };
 static_assert(sizeof(PF_SoundFormatInfo) == 16);
 static_assert(offsetof(PF_SoundFormatInfo, rateF) == 0);
@@ -540,9 +538,9 @@ static_assert(offsetof(PF_SoundFormatInfo, format) == 10);
 static_assert(offsetof(PF_SoundFormatInfo, sample_size) == 12);
 
 struct PF_SoundWorld {
-  PF_SoundFormatInfo fi;
-  A_long num_samples;
-  void* dataP;
+    PF_SoundFormatInfo fi;
+    A_long num_samples;
+    void* dataP;
 };
 static_assert(sizeof(PF_SoundWorld) == 32);
 static_assert(offsetof(PF_SoundWorld, fi) == 0);
@@ -550,7 +548,7 @@ static_assert(offsetof(PF_SoundWorld, num_samples) == 16);
 static_assert(offsetof(PF_SoundWorld, dataP) == 24);
 
 struct PF_UserChangedParamExtra {
-  PF_ParamIndex param_index;
+    PF_ParamIndex param_index;
 };
 static_assert(sizeof(PF_UserChangedParamExtra) == 4);
 static_assert(offsetof(PF_UserChangedParamExtra, param_index) == 0);
@@ -559,23 +557,23 @@ static_assert(offsetof(PF_UserChangedParamExtra, param_index) == 0);
 // Layers (the input parameter, the output, and worlds of the smart-render callbacks).
 
 struct PF_LayerDef {
-  void* reserved0;
-  void* reserved1;
-  PF_WorldFlags world_flags;
-  PF_PixelPtr data;
-  A_long rowbytes;  // may be negative (bottom-up layers)
-  A_long width;
-  A_long height;
-  PF_UnionableRect extent_hint;
-  void* platform_ref;
-  A_long reserved_long1;
-  void* reserved_long4;
-  PF_RationalScale pix_aspect_ratio;
-  void* reserved_long2;
-  A_long origin_x;
-  A_long origin_y;
-  A_long reserved_long3;
-  A_long dephault;
+    void* reserved0;
+    void* reserved1;
+    PF_WorldFlags world_flags;
+    PF_PixelPtr data;
+    A_long rowbytes;  // may be negative (bottom-up layers)
+    A_long width;
+    A_long height;
+    PF_UnionableRect extent_hint;
+    void* platform_ref;
+    A_long reserved_long1;
+    void* reserved_long4;
+    PF_RationalScale pix_aspect_ratio;
+    void* reserved_long2;
+    A_long origin_x;
+    A_long origin_y;
+    A_long reserved_long3;
+    A_long dephault;
 };
 typedef PF_LayerDef PF_EffectWorld;
 static_assert(sizeof(PF_LayerDef) == 120);
@@ -601,14 +599,14 @@ static_assert(offsetof(PF_LayerDef, dephault) == 116);
 // Parameter definitions.
 
 struct PF_SliderDef {
-  PF_ParamValue value;
-  A_char value_str[PF_MAX_PARAM_VALUE_LEN + 1];
-  A_char value_desc[PF_MAX_PARAM_DESCRIPTION_LEN + 1];
-  PF_ParamValue valid_min;
-  PF_ParamValue valid_max;
-  PF_ParamValue slider_min;
-  PF_ParamValue slider_max;
-  PF_ParamValue dephault;
+    PF_ParamValue value;
+    A_char value_str[PF_MAX_PARAM_VALUE_LEN + 1];
+    A_char value_desc[PF_MAX_PARAM_DESCRIPTION_LEN + 1];
+    PF_ParamValue valid_min;
+    PF_ParamValue valid_max;
+    PF_ParamValue slider_min;
+    PF_ParamValue slider_max;
+    PF_ParamValue dephault;
 };
 static_assert(sizeof(PF_SliderDef) == 88);
 static_assert(offsetof(PF_SliderDef, value_str) == 4);
@@ -617,16 +615,16 @@ static_assert(offsetof(PF_SliderDef, valid_min) == 68);
 static_assert(offsetof(PF_SliderDef, dephault) == 84);
 
 struct PF_FixedSliderDef {
-  PF_Fixed value;
-  A_char value_str[PF_MAX_PARAM_VALUE_LEN + 1];
-  A_char value_desc[PF_MAX_PARAM_DESCRIPTION_LEN + 1];
-  PF_Fixed valid_min;
-  PF_Fixed valid_max;
-  PF_Fixed slider_min;
-  PF_Fixed slider_max;
-  PF_Fixed dephault;
-  A_short precision;
-  A_short display_flags;
+    PF_Fixed value;
+    A_char value_str[PF_MAX_PARAM_VALUE_LEN + 1];
+    A_char value_desc[PF_MAX_PARAM_DESCRIPTION_LEN + 1];
+    PF_Fixed valid_min;
+    PF_Fixed valid_max;
+    PF_Fixed slider_min;
+    PF_Fixed slider_max;
+    PF_Fixed dephault;
+    A_short precision;
+    A_short display_flags;
 };
 static_assert(sizeof(PF_FixedSliderDef) == 92);
 static_assert(offsetof(PF_FixedSliderDef, dephault) == 84);
@@ -634,21 +632,21 @@ static_assert(offsetof(PF_FixedSliderDef, precision) == 88);
 static_assert(offsetof(PF_FixedSliderDef, display_flags) == 90);
 
 struct PF_AngleDef {
-  PF_Fixed value;
-  PF_Fixed dephault;
-  PF_Fixed valid_min;
-  PF_Fixed valid_max;
+    PF_Fixed value;
+    PF_Fixed dephault;
+    PF_Fixed valid_min;
+    PF_Fixed valid_max;
 };
 static_assert(sizeof(PF_AngleDef) == 16);
 
 struct PF_CheckBoxDef {
-  A_long value;
-  PF_Boolean dephault;
-  A_char reserved;
-  A_short reserved1;
-  union {
-    const A_char* nameptr;  // label text beside the box
-  } u;
+    A_long value;
+    PF_Boolean dephault;
+    A_char reserved;
+    A_short reserved1;
+    union {
+        const A_char* nameptr;  // label text beside the box
+    } u;
 };
 static_assert(sizeof(PF_CheckBoxDef) == 16);
 static_assert(offsetof(PF_CheckBoxDef, value) == 0);
@@ -658,30 +656,30 @@ static_assert(offsetof(PF_CheckBoxDef, reserved1) == 6);
 static_assert(offsetof(PF_CheckBoxDef, u) == 8);
 
 struct PF_ColorDef {
-  PF_Pixel value;
-  PF_Pixel dephault;
+    PF_Pixel value;
+    PF_Pixel dephault;
 };
 static_assert(sizeof(PF_ColorDef) == 8);
 
 struct PF_PointDef {
-  PF_Fixed x_value;
-  PF_Fixed y_value;
-  A_char reserved[3];
-  PF_Boolean restrict_bounds;
-  PF_Fixed x_dephault;
-  PF_Fixed y_dephault;
+    PF_Fixed x_value;
+    PF_Fixed y_value;
+    A_char reserved[3];
+    PF_Boolean restrict_bounds;
+    PF_Fixed x_dephault;
+    PF_Fixed y_dephault;
 };
 static_assert(sizeof(PF_PointDef) == 20);
 static_assert(offsetof(PF_PointDef, restrict_bounds) == 11);
 static_assert(offsetof(PF_PointDef, x_dephault) == 12);
 
 struct PF_PopupDef {
-  A_long value;  // counts from 1
-  A_short num_choices;
-  A_short dephault;
-  union {
-    const A_char* namesptr;  // choices separated by '|'
-  } u;
+    A_long value;  // counts from 1
+    A_short num_choices;
+    A_short dephault;
+    union {
+        const A_char* namesptr;  // choices separated by '|'
+    } u;
 };
 static_assert(sizeof(PF_PopupDef) == 16);
 static_assert(offsetof(PF_PopupDef, value) == 0);
@@ -691,20 +689,20 @@ static_assert(offsetof(PF_PopupDef, u) == 8);
 
 // The value is double precision, the range and default single precision.
 struct PF_FloatSliderDef {
-  PF_FpLong value;
-  PF_FpLong phase;
-  A_char value_desc[PF_MAX_PARAM_DESCRIPTION_LEN + 1];
-  PF_FpShort valid_min;
-  PF_FpShort valid_max;
-  PF_FpShort slider_min;
-  PF_FpShort slider_max;
-  PF_FpShort dephault;
-  A_short precision;
-  PF_ValueDisplayFlags display_flags;
-  PF_FSliderFlags fs_flags;
-  PF_FpShort curve_tolerance;
-  PF_Boolean useExponent;  // the exponent pair is read only by the Premiere family
-  PF_FpShort exponent;
+    PF_FpLong value;
+    PF_FpLong phase;
+    A_char value_desc[PF_MAX_PARAM_DESCRIPTION_LEN + 1];
+    PF_FpShort valid_min;
+    PF_FpShort valid_max;
+    PF_FpShort slider_min;
+    PF_FpShort slider_max;
+    PF_FpShort dephault;
+    A_short precision;
+    PF_ValueDisplayFlags display_flags;
+    PF_FSliderFlags fs_flags;
+    PF_FpShort curve_tolerance;
+    PF_Boolean useExponent;  // the exponent pair is read only by the Premiere family
+    PF_FpShort exponent;
 };
 static_assert(sizeof(PF_FloatSliderDef) == 88);
 static_assert(offsetof(PF_FloatSliderDef, value) == 0);
@@ -723,11 +721,11 @@ static_assert(offsetof(PF_FloatSliderDef, useExponent) == 80);
 static_assert(offsetof(PF_FloatSliderDef, exponent) == 84);
 
 struct PF_ArbitraryDef {
-  A_short id;
-  A_short pad;
-  PF_ArbitraryH dephault;  // owned by the host once add_param returns
-  PF_ArbitraryH value;     // null at add_param time
-  void* refconPV;
+    A_short id;
+    A_short pad;
+    PF_ArbitraryH dephault;  // owned by the host once add_param returns
+    PF_ArbitraryH value;     // null at add_param time
+    void* refconPV;
 };
 static_assert(sizeof(PF_ArbitraryDef) == 32);
 static_assert(offsetof(PF_ArbitraryDef, id) == 0);
@@ -737,63 +735,63 @@ static_assert(offsetof(PF_ArbitraryDef, value) == 16);
 static_assert(offsetof(PF_ArbitraryDef, refconPV) == 24);
 
 struct PF_PathDef {
-  PF_PathID path_id;
-  A_long reserved0;
-  A_long dephault;
+    PF_PathID path_id;
+    A_long reserved0;
+    A_long dephault;
 };
 static_assert(sizeof(PF_PathDef) == 12);
 
 struct PF_ButtonDef {
-  PF_ParamValue value;
-  union {
-    const A_char* namesptr;
-  } u;
+    PF_ParamValue value;
+    union {
+        const A_char* namesptr;
+    } u;
 };
 static_assert(sizeof(PF_ButtonDef) == 16);
 static_assert(offsetof(PF_ButtonDef, u) == 8);
 
 struct PF_Point3DDef {
-  PF_FpLong x_value;
-  PF_FpLong y_value;
-  PF_FpLong z_value;
-  PF_FpLong x_dephault;
-  PF_FpLong y_dephault;
-  PF_FpLong z_dephault;
-  A_char reserved[16];
+    PF_FpLong x_value;
+    PF_FpLong y_value;
+    PF_FpLong z_value;
+    PF_FpLong x_dephault;
+    PF_FpLong y_dephault;
+    PF_FpLong z_dephault;
+    A_char reserved[16];
 };
 static_assert(sizeof(PF_Point3DDef) == 64);
 static_assert(offsetof(PF_Point3DDef, reserved) == 48);
 
 union PF_ParamDefUnion {
-  PF_LayerDef ld;
-  PF_SliderDef sd;
-  PF_FixedSliderDef fd;
-  PF_AngleDef ad;
-  PF_CheckBoxDef bd;
-  PF_ColorDef cd;
-  PF_PointDef td;
-  PF_PopupDef pd;
-  PF_FloatSliderDef fs_d;
-  PF_ArbitraryDef arb_d;
-  PF_PathDef path_d;
-  PF_ButtonDef button_d;
-  PF_Point3DDef point3d_d;
+    PF_LayerDef ld;
+    PF_SliderDef sd;
+    PF_FixedSliderDef fd;
+    PF_AngleDef ad;
+    PF_CheckBoxDef bd;
+    PF_ColorDef cd;
+    PF_PointDef td;
+    PF_PopupDef pd;
+    PF_FloatSliderDef fs_d;
+    PF_ArbitraryDef arb_d;
+    PF_PathDef path_d;
+    PF_ButtonDef button_d;
+    PF_Point3DDef point3d_d;
 };
 static_assert(sizeof(PF_ParamDefUnion) == 120);
 
 struct PF_ParamDef {
-  union {
-    A_long id;                    // at add_param time
-    PF_ChangeFlags change_flags;  // at every other time
-  } uu;
-  PF_ParamUIFlags ui_flags;
-  A_short ui_width;  // only with PF_PUI_CONTROL
-  A_short ui_height;
-  PF_ParamType param_type;
-  A_char name[32];
-  PF_ParamFlags flags;
-  A_long unused;
-  PF_ParamDefUnion u;
+    union {
+        A_long id;                    // at add_param time
+        PF_ChangeFlags change_flags;  // at every other time
+    } uu;
+    PF_ParamUIFlags ui_flags;
+    A_short ui_width;  // only with PF_PUI_CONTROL
+    A_short ui_height;
+    PF_ParamType param_type;
+    A_char name[32];
+    PF_ParamFlags flags;
+    A_long unused;
+    PF_ParamDefUnion u;
 };
 typedef PF_ParamDef* PF_ParamDefPtr;
 typedef PF_ParamDef** PF_ParamList;  // params[0] is the input layer
@@ -814,20 +812,20 @@ static_assert(offsetof(PF_ParamDef, u) == 56);
 struct PF_CustomUIInfo;
 
 struct PF_InteractCallbacks {
-  // `param` must not point into the params array the host passed in.
-  PF_Err(SPAPI* checkout_param)(PF_ProgPtr effect_ref, PF_ParamIndex index, A_long what_time,
-                                A_long time_step, A_u_long time_scale, PF_ParamDef* param);
-  PF_Err(SPAPI* checkin_param)(PF_ProgPtr effect_ref, PF_ParamDef* param);
-  // index -1 appends.
-  PF_Err(SPAPI* add_param)(PF_ProgPtr effect_ref, PF_ParamIndex index, PF_ParamDefPtr def);
-  PF_Err(SPAPI* abort)(PF_ProgPtr effect_ref);
-  PF_Err(SPAPI* progress)(PF_ProgPtr effect_ref, A_long current, A_long total);
-  PF_Err(SPAPI* register_ui)(PF_ProgPtr effect_ref, PF_CustomUIInfo* cust_info);
-  PF_UnusedProc checkout_layer_audio;
-  PF_UnusedProc checkin_layer_audio;
-  PF_UnusedProc get_audio_data;
-  void* reserved_str[3];
-  void* reserved[10];
+    // `param` must not point into the params array the host passed in.
+    PF_Err(SPAPI* checkout_param)(PF_ProgPtr effect_ref, PF_ParamIndex index, A_long what_time, A_long time_step,
+                                  A_u_long time_scale, PF_ParamDef* param);
+    PF_Err(SPAPI* checkin_param)(PF_ProgPtr effect_ref, PF_ParamDef* param);
+    // index -1 appends.
+    PF_Err(SPAPI* add_param)(PF_ProgPtr effect_ref, PF_ParamIndex index, PF_ParamDefPtr def);
+    PF_Err(SPAPI* abort)(PF_ProgPtr effect_ref);
+    PF_Err(SPAPI* progress)(PF_ProgPtr effect_ref, A_long current, A_long total);
+    PF_Err(SPAPI* register_ui)(PF_ProgPtr effect_ref, PF_CustomUIInfo* cust_info);
+    PF_UnusedProc checkout_layer_audio;
+    PF_UnusedProc checkin_layer_audio;
+    PF_UnusedProc get_audio_data;
+    void* reserved_str[3];
+    void* reserved[10];
 };
 static_assert(sizeof(PF_InteractCallbacks) == 176);
 static_assert(offsetof(PF_InteractCallbacks, checkout_param) == 0);
@@ -846,89 +844,88 @@ static_assert(offsetof(PF_InteractCallbacks, reserved) == 96);
 // Utility callbacks (in_data->utils).
 
 struct PF_ANSICallbacks {
-  A_FpLong(SPAPI* atan)(A_FpLong);
-  A_FpLong(SPAPI* atan2)(A_FpLong y, A_FpLong x);
-  A_FpLong(SPAPI* ceil)(A_FpLong);
-  A_FpLong(SPAPI* cos)(A_FpLong);
-  A_FpLong(SPAPI* exp)(A_FpLong);
-  A_FpLong(SPAPI* fabs)(A_FpLong);
-  A_FpLong(SPAPI* floor)(A_FpLong);
-  A_FpLong(SPAPI* fmod)(A_FpLong x, A_FpLong y);
-  A_FpLong(SPAPI* hypot)(A_FpLong x, A_FpLong y);
-  A_FpLong(SPAPI* log)(A_FpLong);
-  A_FpLong(SPAPI* log10)(A_FpLong);
-  A_FpLong(SPAPI* pow)(A_FpLong x, A_FpLong y);
-  A_FpLong(SPAPI* sin)(A_FpLong);
-  A_FpLong(SPAPI* sqrt)(A_FpLong);
-  A_FpLong(SPAPI* tan)(A_FpLong);
-  int(SPAPI* sprintf)(A_char*, const A_char*, ...);
-  A_char*(SPAPI* strcpy)(A_char*, const A_char*);
-  A_FpLong(SPAPI* asin)(A_FpLong);
-  A_FpLong(SPAPI* acos)(A_FpLong);
-  A_long ansi_procs[1];
+    A_FpLong(SPAPI* atan)(A_FpLong);
+    A_FpLong(SPAPI* atan2)(A_FpLong y, A_FpLong x);
+    A_FpLong(SPAPI* ceil)(A_FpLong);
+    A_FpLong(SPAPI* cos)(A_FpLong);
+    A_FpLong(SPAPI* exp)(A_FpLong);
+    A_FpLong(SPAPI* fabs)(A_FpLong);
+    A_FpLong(SPAPI* floor)(A_FpLong);
+    A_FpLong(SPAPI* fmod)(A_FpLong x, A_FpLong y);
+    A_FpLong(SPAPI* hypot)(A_FpLong x, A_FpLong y);
+    A_FpLong(SPAPI* log)(A_FpLong);
+    A_FpLong(SPAPI* log10)(A_FpLong);
+    A_FpLong(SPAPI* pow)(A_FpLong x, A_FpLong y);
+    A_FpLong(SPAPI* sin)(A_FpLong);
+    A_FpLong(SPAPI* sqrt)(A_FpLong);
+    A_FpLong(SPAPI* tan)(A_FpLong);
+    int(SPAPI* sprintf)(A_char*, const A_char*, ...);
+    A_char*(SPAPI* strcpy)(A_char*, const A_char*);
+    A_FpLong(SPAPI* asin)(A_FpLong);
+    A_FpLong(SPAPI* acos)(A_FpLong);
+    A_long ansi_procs[1];
 };
 static_assert(sizeof(PF_ANSICallbacks) == 160);
 static_assert(offsetof(PF_ANSICallbacks, acos) == 144);
 static_assert(offsetof(PF_ANSICallbacks, ansi_procs) == 152);
 
 struct PF_ColorCallbacks {
-  PF_UnusedProc RGBtoHLS;
-  PF_UnusedProc HLStoRGB;
-  PF_UnusedProc RGBtoYIQ;
-  PF_UnusedProc YIQtoRGB;
-  PF_UnusedProc Luminance;
-  PF_UnusedProc Hue;
-  PF_UnusedProc Lightness;
-  PF_UnusedProc Saturation;
+    PF_UnusedProc RGBtoHLS;
+    PF_UnusedProc HLStoRGB;
+    PF_UnusedProc RGBtoYIQ;
+    PF_UnusedProc YIQtoRGB;
+    PF_UnusedProc Luminance;
+    PF_UnusedProc Hue;
+    PF_UnusedProc Lightness;
+    PF_UnusedProc Saturation;
 };
 static_assert(sizeof(PF_ColorCallbacks) == 64);
 
 struct PF_UtilCallbacks {
-  PF_UnusedProc begin_sampling;
-  PF_UnusedProc subpixel_sample;
-  PF_UnusedProc area_sample;
-  void* get_batch_func_is_deprecated;
-  PF_UnusedProc end_sampling;
-  PF_UnusedProc composite_rect;
-  PF_UnusedProc blend;
-  PF_UnusedProc convolve;
-  PF_UnusedProc copy;
-  // A null colour fills with zero pixels; a null rectangle fills the whole world.
-  PF_Err(SPAPI* fill)(PF_ProgPtr effect_ref, const PF_Pixel* color, const PF_Rect* dst_rect,
-                      PF_EffectWorld* world);
-  PF_UnusedProc gaussian_kernel;
-  PF_UnusedProc iterate;
-  PF_UnusedProc premultiply;
-  PF_UnusedProc premultiply_color;
-  PF_UnusedProc new_world;
-  PF_UnusedProc dispose_world;
-  PF_UnusedProc iterate_origin;
-  PF_UnusedProc iterate_lut;
-  PF_UnusedProc transfer_rect;
-  PF_UnusedProc transform_world;
-  PF_Handle(SPAPI* host_new_handle)(A_u_longlong size);
-  void*(SPAPI* host_lock_handle)(PF_Handle pf_handle);
-  void(SPAPI* host_unlock_handle)(PF_Handle pf_handle);
-  void(SPAPI* host_dispose_handle)(PF_Handle pf_handle);
-  PF_UnusedProc get_callback_addr;
-  PF_UnusedProc app;
-  PF_ANSICallbacks ansi;
-  PF_ColorCallbacks colorCB;
-  PF_Err(SPAPI* get_platform_data)(PF_ProgPtr effect_ref, PF_PlatDataID which, void* data);
-  A_u_longlong(SPAPI* host_get_handle_size)(PF_Handle pf_handle);
-  PF_UnusedProc iterate_origin_non_clip_src;
-  PF_UnusedProc iterate_generic;
-  PF_Err(SPAPI* host_resize_handle)(A_u_longlong new_sizeL, PF_Handle* handleP);
-  PF_UnusedProc subpixel_sample16;
-  PF_UnusedProc area_sample16;
-  PF_UnusedProc fill16;
-  PF_UnusedProc premultiply_color16;
-  PF_UnusedProc iterate16;
-  PF_UnusedProc iterate_origin16;
-  PF_UnusedProc iterate_origin_non_clip_src16;
-  PF_UnusedProc get_pixel_data8;
-  PF_UnusedProc get_pixel_data16;
-  A_long reserved[1];
+    PF_UnusedProc begin_sampling;
+    PF_UnusedProc subpixel_sample;
+    PF_UnusedProc area_sample;
+    void* get_batch_func_is_deprecated;
+    PF_UnusedProc end_sampling;
+    PF_UnusedProc composite_rect;
+    PF_UnusedProc blend;
+    PF_UnusedProc convolve;
+    PF_UnusedProc copy;
+    // A null colour fills with zero pixels; a null rectangle fills the whole world.
+    PF_Err(SPAPI* fill)(PF_ProgPtr effect_ref, const PF_Pixel* color, const PF_Rect* dst_rect, PF_EffectWorld* world);
+    PF_UnusedProc gaussian_kernel;
+    PF_UnusedProc iterate;
+    PF_UnusedProc premultiply;
+    PF_UnusedProc premultiply_color;
+    PF_UnusedProc new_world;
+    PF_UnusedProc dispose_world;
+    PF_UnusedProc iterate_origin;
+    PF_UnusedProc iterate_lut;
+    PF_UnusedProc transfer_rect;
+    PF_UnusedProc transform_world;
+    PF_Handle(SPAPI* host_new_handle)(A_u_longlong size);
+    void*(SPAPI* host_lock_handle)(PF_Handle pf_handle);
+    void(SPAPI* host_unlock_handle)(PF_Handle pf_handle);
+    void(SPAPI* host_dispose_handle)(PF_Handle pf_handle);
+    PF_UnusedProc get_callback_addr;
+    PF_UnusedProc app;
+    PF_ANSICallbacks ansi;
+    PF_ColorCallbacks colorCB;
+    PF_Err(SPAPI* get_platform_data)(PF_ProgPtr effect_ref, PF_PlatDataID which, void* data);
+    A_u_longlong(SPAPI* host_get_handle_size)(PF_Handle pf_handle);
+    PF_UnusedProc iterate_origin_non_clip_src;
+    PF_UnusedProc iterate_generic;
+    PF_Err(SPAPI* host_resize_handle)(A_u_longlong new_sizeL, PF_Handle* handleP);
+    PF_UnusedProc subpixel_sample16;
+    PF_UnusedProc area_sample16;
+    PF_UnusedProc fill16;
+    PF_UnusedProc premultiply_color16;
+    PF_UnusedProc iterate16;
+    PF_UnusedProc iterate_origin16;
+    PF_UnusedProc iterate_origin_non_clip_src16;
+    PF_UnusedProc get_pixel_data8;
+    PF_UnusedProc get_pixel_data16;
+    A_long reserved[1];
 };
 static_assert(sizeof(PF_UtilCallbacks) == 552);
 static_assert(offsetof(PF_UtilCallbacks, begin_sampling) == 0);
@@ -957,44 +954,44 @@ static_assert(offsetof(PF_UtilCallbacks, reserved) == 544);
 // The host's parameter blocks.
 
 struct PF_InData {
-  PF_InteractCallbacks inter;
-  PF_UtilCallbacks* utils;
-  PF_ProgPtr effect_ref;
-  PF_Quality quality;
-  PF_SpecVersion version;
-  A_long serial_num;
-  A_long appl_id;
-  A_long num_params;
-  A_long reserved;
-  A_long what_cpu;
-  A_long what_fpu;
-  A_long current_time;
-  A_long time_step;
-  A_long total_time;
-  A_long local_time_step;
-  A_u_long time_scale;
-  PF_Field field;
-  PF_Fixed shutter_angle;
-  A_long width;
-  A_long height;
-  PF_Rect extent_hint;
-  A_long output_origin_x;
-  A_long output_origin_y;
-  PF_RationalScale downsample_x;
-  PF_RationalScale downsample_y;
-  PF_RationalScale pixel_aspect_ratio;
-  PF_InFlags in_flags;
-  PF_Handle global_data;
-  PF_Handle sequence_data;
-  PF_Handle frame_data;
-  A_long start_sampL;
-  A_long dur_sampL;
-  A_long total_sampL;
-  PF_SoundWorld src_snd;
-  SPBasicSuite* pica_basicP;
-  A_long pre_effect_source_origin_x;
-  A_long pre_effect_source_origin_y;
-  PF_Fixed shutter_phase;
+    PF_InteractCallbacks inter;
+    PF_UtilCallbacks* utils;
+    PF_ProgPtr effect_ref;
+    PF_Quality quality;
+    PF_SpecVersion version;
+    A_long serial_num;
+    A_long appl_id;
+    A_long num_params;
+    A_long reserved;
+    A_long what_cpu;
+    A_long what_fpu;
+    A_long current_time;
+    A_long time_step;
+    A_long total_time;
+    A_long local_time_step;
+    A_u_long time_scale;
+    PF_Field field;
+    PF_Fixed shutter_angle;
+    A_long width;
+    A_long height;
+    PF_Rect extent_hint;
+    A_long output_origin_x;
+    A_long output_origin_y;
+    PF_RationalScale downsample_x;
+    PF_RationalScale downsample_y;
+    PF_RationalScale pixel_aspect_ratio;
+    PF_InFlags in_flags;
+    PF_Handle global_data;
+    PF_Handle sequence_data;
+    PF_Handle frame_data;
+    A_long start_sampL;
+    A_long dur_sampL;
+    A_long total_sampL;
+    PF_SoundWorld src_snd;
+    SPBasicSuite* pica_basicP;
+    A_long pre_effect_source_origin_x;
+    A_long pre_effect_source_origin_y;
+    PF_Fixed shutter_phase;
 };
 static_assert(sizeof(PF_InData) == 408);
 static_assert(offsetof(PF_InData, inter) == 0);
@@ -1038,22 +1035,22 @@ static_assert(offsetof(PF_InData, pre_effect_source_origin_y) == 396);
 static_assert(offsetof(PF_InData, shutter_phase) == 400);
 
 struct PF_OutData {
-  A_u_long my_version;
-  A_char name[32];
-  PF_Handle global_data;
-  A_long num_params;
-  PF_Handle sequence_data;
-  A_long flat_sdata_size;  // obsolete
-  PF_Handle frame_data;
-  A_long width;
-  A_long height;
-  PF_Point origin;
-  PF_OutFlags out_flags;
-  A_char return_msg[PF_MAX_EFFECT_MSG_LEN + 1];
-  A_long start_sampL;
-  A_long dur_sampL;
-  PF_SoundWorld dest_snd;
-  PF_OutFlags2 out_flags2;
+    A_u_long my_version;
+    A_char name[32];
+    PF_Handle global_data;
+    A_long num_params;
+    PF_Handle sequence_data;
+    A_long flat_sdata_size;  // obsolete
+    PF_Handle frame_data;
+    A_long width;
+    A_long height;
+    PF_Point origin;
+    PF_OutFlags out_flags;
+    A_char return_msg[PF_MAX_EFFECT_MSG_LEN + 1];
+    A_long start_sampL;
+    A_long dur_sampL;
+    PF_SoundWorld dest_snd;
+    PF_OutFlags2 out_flags2;
 };
 static_assert(sizeof(PF_OutData) == 408);
 static_assert(offsetof(PF_OutData, my_version) == 0);
@@ -1078,76 +1075,76 @@ static_assert(offsetof(PF_OutData, out_flags2) == 400);
 // members below belong to the caller.
 
 struct PF_ArbParamsExtra {
-  PF_FunctionSelector which_function;
-  A_short id;  // the arbitrary id given at add_param time
-  A_short padding;
-  union {
-    struct {
-      void* refconPV;
-      PF_ArbitraryH* arbPH;  // out
-    } new_func_params;
-    struct {
-      void* refconPV;
-      PF_ArbitraryH arbH;
-    } dispose_func_params;
-    struct {
-      void* refconPV;
-      PF_ArbitraryH src_arbH;
-      PF_ArbitraryH* dst_arbPH;  // out
-    } copy_func_params;
-    struct {
-      void* refconPV;
-      PF_ArbitraryH arbH;
-      A_u_long* flat_data_sizePLu;  // out
-    } flat_size_func_params;
-    struct {
-      void* refconPV;
-      PF_ArbitraryH arbH;
-      A_u_long buf_sizeLu;
-      void* flat_dataPV;  // allocated by the host, buf_sizeLu bytes
-    } flatten_func_params;
-    struct {
-      void* refconPV;
-      A_u_long buf_sizeLu;
-      const void* flat_dataPV;
-      PF_ArbitraryH* arbPH;  // out
-    } unflatten_func_params;
-    struct {
-      void* refconPV;
-      PF_ArbitraryH left_arbH;
-      PF_ArbitraryH right_arbH;
-      PF_FpLong tF;  // 0..1
-      PF_ArbitraryH* interpPH;  // out
-    } interp_func_params;
-    struct {
-      void* refconPV;
-      PF_ArbitraryH a_arbH;
-      PF_ArbitraryH b_arbH;
-      PF_ArbCompareResult* compareP;  // out
-    } compare_func_params;
-    struct {
-      void* refconPV;
-      PF_ArbitraryH arbH;
-      A_u_long* print_sizePLu;  // out
-    } print_size_func_params;
-    struct {
-      void* refconPV;
-      PF_ArbPrintFlags print_flags;
-      PF_ArbitraryH arbH;
-      A_u_long print_sizeLu;
-      A_char* print_bufferPC;
-    } print_func_params;
-    struct {
-      void* refconPV;
-      const A_char* bufPC;
-      A_u_long bytes_to_scanLu;
-      PF_ArbitraryH* arbPH;  // out
-    } scan_func_params;
-  } u;
+    PF_FunctionSelector which_function;
+    A_short id;  // the arbitrary id given at add_param time
+    A_short padding;
+    union {
+        struct {
+            void* refconPV;
+            PF_ArbitraryH* arbPH;  // out
+        } new_func_params;
+        struct {
+            void* refconPV;
+            PF_ArbitraryH arbH;
+        } dispose_func_params;
+        struct {
+            void* refconPV;
+            PF_ArbitraryH src_arbH;
+            PF_ArbitraryH* dst_arbPH;  // out
+        } copy_func_params;
+        struct {
+            void* refconPV;
+            PF_ArbitraryH arbH;
+            A_u_long* flat_data_sizePLu;  // out
+        } flat_size_func_params;
+        struct {
+            void* refconPV;
+            PF_ArbitraryH arbH;
+            A_u_long buf_sizeLu;
+            void* flat_dataPV;  // allocated by the host, buf_sizeLu bytes
+        } flatten_func_params;
+        struct {
+            void* refconPV;
+            A_u_long buf_sizeLu;
+            const void* flat_dataPV;
+            PF_ArbitraryH* arbPH;  // out
+        } unflatten_func_params;
+        struct {
+            void* refconPV;
+            PF_ArbitraryH left_arbH;
+            PF_ArbitraryH right_arbH;
+            PF_FpLong tF;             // 0..1
+            PF_ArbitraryH* interpPH;  // out
+        } interp_func_params;
+        struct {
+            void* refconPV;
+            PF_ArbitraryH a_arbH;
+            PF_ArbitraryH b_arbH;
+            PF_ArbCompareResult* compareP;  // out
+        } compare_func_params;
+        struct {
+            void* refconPV;
+            PF_ArbitraryH arbH;
+            A_u_long* print_sizePLu;  // out
+        } print_size_func_params;
+        struct {
+            void* refconPV;
+            PF_ArbPrintFlags print_flags;
+            PF_ArbitraryH arbH;
+            A_u_long print_sizeLu;
+            A_char* print_bufferPC;
+        } print_func_params;
+        struct {
+            void* refconPV;
+            const A_char* bufPC;
+            A_u_long bytes_to_scanLu;
+            PF_ArbitraryH* arbPH;  // out
+        } scan_func_params;
+    } u;
 };
 
 #define VT_ARB_OFFSET(member, field) \
-  (offsetof(PF_ArbParamsExtra, u) + offsetof(decltype(PF_ArbParamsExtra::u.member), field))
+    (offsetof(PF_ArbParamsExtra, u) + offsetof(decltype(PF_ArbParamsExtra::u.member), field))
 static_assert(sizeof(PF_ArbParamsExtra) == 48);
 static_assert(offsetof(PF_ArbParamsExtra, which_function) == 0);
 static_assert(offsetof(PF_ArbParamsExtra, id) == 4);
@@ -1190,12 +1187,12 @@ static_assert(VT_ARB_OFFSET(scan_func_params, arbPH) == 32);
 // here, so these records must never be allocated or copied whole on the module's side.
 
 struct PF_RenderRequest {
-  PF_LRect rect;
-  PF_Field field;
-  PF_ChannelMask channel_mask;
-  PF_Boolean preserve_rgb_of_zero_alpha;
-  A_char unused[3];
-  A_long reserved[4];
+    PF_LRect rect;
+    PF_Field field;
+    PF_ChannelMask channel_mask;
+    PF_Boolean preserve_rgb_of_zero_alpha;
+    A_char unused[3];
+    A_long reserved[4];
 };
 static_assert(sizeof(PF_RenderRequest) == 44);
 static_assert(offsetof(PF_RenderRequest, rect) == 0);
@@ -1206,8 +1203,8 @@ static_assert(offsetof(PF_RenderRequest, unused) == 25);
 static_assert(offsetof(PF_RenderRequest, reserved) == 28);
 
 struct PF_PreRenderInput {
-  PF_RenderRequest output_request;
-  A_short bitdepth;
+    PF_RenderRequest output_request;
+    A_short bitdepth;
 };
 static_assert(sizeof(PF_PreRenderInput) == 48);
 static_assert(offsetof(PF_PreRenderInput, output_request) == 0);
@@ -1216,13 +1213,13 @@ static_assert(offsetof(PF_PreRenderInput, bitdepth) == 44);
 typedef void(SPAPI* PF_DeletePreRenderDataFunc)(void* pre_render_data);
 
 struct PF_PreRenderOutput {
-  PF_LRect result_rect;
-  PF_LRect max_result_rect;
-  PF_Boolean solid;
-  PF_Boolean reserved;
-  PF_RenderOutputFlags flags;
-  void* pre_render_data;
-  PF_DeletePreRenderDataFunc delete_pre_render_data_func;
+    PF_LRect result_rect;
+    PF_LRect max_result_rect;
+    PF_Boolean solid;
+    PF_Boolean reserved;
+    PF_RenderOutputFlags flags;
+    void* pre_render_data;
+    PF_DeletePreRenderDataFunc delete_pre_render_data_func;
 };
 static_assert(sizeof(PF_PreRenderOutput) == 56);
 static_assert(offsetof(PF_PreRenderOutput, result_rect) == 0);
@@ -1234,14 +1231,14 @@ static_assert(offsetof(PF_PreRenderOutput, pre_render_data) == 40);
 static_assert(offsetof(PF_PreRenderOutput, delete_pre_render_data_func) == 48);
 
 struct PF_CheckoutResult {
-  PF_LRect result_rect;
-  PF_LRect max_result_rect;
-  PF_RationalScale par;
-  PF_Boolean solid;
-  PF_Boolean reservedB[3];
-  A_long ref_width;
-  A_long ref_height;
-  A_long reserved[6];
+    PF_LRect result_rect;
+    PF_LRect max_result_rect;
+    PF_RationalScale par;
+    PF_Boolean solid;
+    PF_Boolean reservedB[3];
+    A_long ref_width;
+    A_long ref_height;
+    A_long reserved[6];
 };
 static_assert(sizeof(PF_CheckoutResult) == 76);
 static_assert(offsetof(PF_CheckoutResult, result_rect) == 0);
@@ -1254,18 +1251,18 @@ static_assert(offsetof(PF_CheckoutResult, ref_height) == 48);
 static_assert(offsetof(PF_CheckoutResult, reserved) == 52);
 
 struct PF_PreRenderCallbacks {
-  // index 0 is the input layer; checkout_idL is the module's own non-negative, unique id.
-  PF_Err(SPAPI* checkout_layer)(PF_ProgPtr effect_ref, PF_ParamIndex index, A_long checkout_idL,
-                                const PF_RenderRequest* req, A_long what_time, A_long time_step,
-                                A_u_long time_scale, PF_CheckoutResult* checkout_result);
+    // index 0 is the input layer; checkout_idL is the module's own non-negative, unique id.
+    PF_Err(SPAPI* checkout_layer)(PF_ProgPtr effect_ref, PF_ParamIndex index, A_long checkout_idL,
+                                  const PF_RenderRequest* req, A_long what_time, A_long time_step, A_u_long time_scale,
+                                  PF_CheckoutResult* checkout_result);
 };
 static_assert(sizeof(PF_PreRenderCallbacks) == 8);
 static_assert(offsetof(PF_PreRenderCallbacks, checkout_layer) == 0);
 
 struct PF_PreRenderExtra {
-  PF_PreRenderInput* input;
-  PF_PreRenderOutput* output;
-  PF_PreRenderCallbacks* cb;
+    PF_PreRenderInput* input;
+    PF_PreRenderOutput* output;
+    PF_PreRenderCallbacks* cb;
 };
 static_assert(sizeof(PF_PreRenderExtra) == 24);
 static_assert(offsetof(PF_PreRenderExtra, input) == 0);
@@ -1273,9 +1270,9 @@ static_assert(offsetof(PF_PreRenderExtra, output) == 8);
 static_assert(offsetof(PF_PreRenderExtra, cb) == 16);
 
 struct PF_SmartRenderInput {
-  PF_RenderRequest output_request;
-  A_short bitdepth;
-  void* pre_render_data;
+    PF_RenderRequest output_request;
+    A_short bitdepth;
+    void* pre_render_data;
 };
 static_assert(sizeof(PF_SmartRenderInput) == 56);
 static_assert(offsetof(PF_SmartRenderInput, output_request) == 0);
@@ -1283,10 +1280,9 @@ static_assert(offsetof(PF_SmartRenderInput, bitdepth) == 44);
 static_assert(offsetof(PF_SmartRenderInput, pre_render_data) == 48);
 
 struct PF_SmartRenderCallbacks {
-  PF_Err(SPAPI* checkout_layer_pixels)(PF_ProgPtr effect_ref, A_long checkout_idL,
-                                       PF_EffectWorld** pixels);
-  PF_Err(SPAPI* checkin_layer_pixels)(PF_ProgPtr effect_ref, A_long checkout_idL);
-  PF_Err(SPAPI* checkout_output)(PF_ProgPtr effect_ref, PF_EffectWorld** output);
+    PF_Err(SPAPI* checkout_layer_pixels)(PF_ProgPtr effect_ref, A_long checkout_idL, PF_EffectWorld** pixels);
+    PF_Err(SPAPI* checkin_layer_pixels)(PF_ProgPtr effect_ref, A_long checkout_idL);
+    PF_Err(SPAPI* checkout_output)(PF_ProgPtr effect_ref, PF_EffectWorld** output);
 };
 static_assert(sizeof(PF_SmartRenderCallbacks) == 24);
 static_assert(offsetof(PF_SmartRenderCallbacks, checkout_layer_pixels) == 0);
@@ -1294,8 +1290,8 @@ static_assert(offsetof(PF_SmartRenderCallbacks, checkin_layer_pixels) == 8);
 static_assert(offsetof(PF_SmartRenderCallbacks, checkout_output) == 16);
 
 struct PF_SmartRenderExtra {
-  PF_SmartRenderInput* input;
-  PF_SmartRenderCallbacks* cb;
+    PF_SmartRenderInput* input;
+    PF_SmartRenderCallbacks* cb;
 };
 static_assert(sizeof(PF_SmartRenderExtra) == 16);
 static_assert(offsetof(PF_SmartRenderExtra, input) == 0);
@@ -1304,7 +1300,7 @@ static_assert(offsetof(PF_SmartRenderExtra, cb) == 8);
 // ---------------------------------------------------------------------------------------------------
 // The entry point. Exported with C linkage under the name the property list's '8664' entry gives.
 
-typedef PF_Err(SPAPI* PF_FilterProc)(PF_Cmd cmd, PF_InData* in_data, PF_OutData* out_data,
-                                     PF_ParamList params, PF_LayerDef* output, void* extra);
+typedef PF_Err(SPAPI* PF_FilterProc)(PF_Cmd cmd, PF_InData* in_data, PF_OutData* out_data, PF_ParamList params,
+                                     PF_LayerDef* output, void* extra);
 
 }  // extern "C"

@@ -18,13 +18,13 @@ constexpr const char* kSPBasicSuite = "SP Basic Suite";
 constexpr int32_t kSPBasicSuiteVersion = 4;
 
 struct SPBasicSuite {
-  SPErr(SPAPI* AcquireSuite)(const char* name, int32_t version, const void** suite);
-  SPErr(SPAPI* ReleaseSuite)(const char* name, int32_t version);
-  SPBoolean(SPAPI* IsEqual)(const char* token1, const char* token2);
-  SPErr(SPAPI* AllocateBlock)(size_t size, void** block);
-  SPErr(SPAPI* FreeBlock)(void* block);
-  SPErr(SPAPI* ReallocateBlock)(void* block, size_t newSize, void** newblock);
-  SPErr(SPAPI* Undefined)(void);
+    SPErr(SPAPI* AcquireSuite)(const char* name, int32_t version, const void** suite);
+    SPErr(SPAPI* ReleaseSuite)(const char* name, int32_t version);
+    SPBoolean(SPAPI* IsEqual)(const char* token1, const char* token2);
+    SPErr(SPAPI* AllocateBlock)(size_t size, void** block);
+    SPErr(SPAPI* FreeBlock)(void* block);
+    SPErr(SPAPI* ReallocateBlock)(void* block, size_t newSize, void** newblock);
+    SPErr(SPAPI* Undefined)(void);
 };
 static_assert(sizeof(SPBasicSuite) == 56);
 static_assert(offsetof(SPBasicSuite, AcquireSuite) == 0);
