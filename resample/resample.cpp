@@ -133,7 +133,7 @@ size_t ResizeWorkSize(ResampleKind kind, uint32_t srcWidth, uint32_t srcHeight, 
 int32_t ResizeCubic(ResampleKind kind, const ResampleImage& src, const ResampleImage& dst, double xFactor,
                     double yFactor, void* work, size_t workSize) {
     if (dst.width == 0 || dst.height == 0) return kResampleOk;
-    if (src.pixels == nullptr || dst.pixels == nullptr || work == nullptr) return kResampleNullPointer;
+    if (src.pixels == nullptr || dst.pixels == nullptr) return kResampleNullPointer;
     if (src.width == 0 || src.height == 0) return kResampleBadSize;
     const uint32_t bpp = BytesPerPixel(kind);
     if (src.rowBytes < 0 || static_cast<uint64_t>(src.rowBytes) < static_cast<uint64_t>(src.width) * bpp ||
@@ -142,6 +142,7 @@ int32_t ResizeCubic(ResampleKind kind, const ResampleImage& src, const ResampleI
     }
     if (!ValidFactor(xFactor) || !ValidFactor(yFactor)) return kResampleBadFactor;
     const size_t needed = ResizeWorkSize(kind, src.width, src.height, dst.width, dst.height, xFactor, yFactor);
+    if (work == nullptr) return kResampleNullPointer;
     if (workSize < needed) return kResampleSmallWorkBuffer;
 
     const uint32_t tapsX = Taps(src.width, xFactor), tapsY = Taps(src.height, yFactor);
