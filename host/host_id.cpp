@@ -85,6 +85,8 @@ HostCode IdentifyHost() {
     return g_hostCache;
 }
 
+void ForgetHostIdentity() { g_hostCache = kHostUnknown; }
+
 void HostPanelColors(const GlobalState* global, const PF_InData* in_data, PF_App_Color* background,
                      PF_App_Color* text, int* dark) {
     *text = kBlack;

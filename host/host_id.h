@@ -28,6 +28,9 @@ HostCode IdentifyHostFrom(const char* loweredCommandLine, const char* loweredExe
 // Identifies the process's host once; an unidentified result is computed again at the next call.
 HostCode IdentifyHost();
 
+// Forgets the identified host, so that the next IdentifyHost looks again (tests only).
+void ForgetHostIdentity();
+
 // The colours the custom controls paint their frame with; dark is 1 when the panel is dark.
 void HostPanelColors(const GlobalState* global, const PF_InData* in_data, PF_App_Color* background,
                      PF_App_Color* text, int* dark);

@@ -332,6 +332,7 @@ void Host::RecordMessage(const char* text, int kind) {
         std::lock_guard<std::mutex> guard(m_recordMutex);
         m_messages.push_back({kind, text ? text : ""});
     }
+    if (m_onMessage) m_onMessage(Message{kind, text ? text : ""});
     if (!m_echoMessages) return;
     const char* label = kind == 1 ? "warning" : kind == 2 ? "error" : kind == 3 ? "info" : "message";
     std::fprintf(stderr, "%s: %s\n", label, text ? text : "");

@@ -4,6 +4,7 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <map>
 #include <memory>
 #include <mutex>
@@ -64,6 +65,8 @@ public:
     std::vector<std::string> debugLines() const;
     void ClearRecords();
     void SetEchoMessages(bool echo) { m_echoMessages = echo; }
+    // Called on the module's thread for each message box, while the module waits for it to close.
+    void SetMessageCallback(std::function<void(const Message&)> callback) { m_onMessage = std::move(callback); }
     int aboutBoxesShown() const { return m_aboutBoxes; }
     const std::vector<int32_t>& pixelFormats() const { return m_pixelFormats; }
     int pixelFormatClears() const { return m_pixelFormatClears; }
@@ -115,6 +118,7 @@ private:
     int m_suiteAcquisitions = 0;
     std::map<std::string, bool> m_suiteOverrides;
     bool m_echoMessages = true;
+    std::function<void(const Message&)> m_onMessage;
     int m_aboutBoxes = 0;
     std::vector<int32_t> m_pixelFormats;
     int m_pixelFormatClears = 0;

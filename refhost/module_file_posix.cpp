@@ -10,7 +10,7 @@
 #include <fstream>
 #include <iterator>
 
-#include "platform/posix_hooks.h"
+#include "platform/host_hooks.h"
 
 namespace refhost {
 
