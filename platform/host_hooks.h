@@ -1,7 +1,8 @@
-// The one hook the POSIX build of the module exports besides its entry point: the hosting process
-// installs sinks for message boxes, debugger output and the about box, and may present another
-// process identity (command line and executable path) to the module's host identification.
-// Plain C so that a host loading the module with dlopen can call it.
+// The one hook the module exports besides its entry point: the hosting process (the reference host,
+// the tests) installs sinks for message boxes, debugger output and the about box, and may present
+// another process identity (command line and executable path) to the module's host identification.
+// Plain C so that a host can resolve it with dlsym or GetProcAddress. A real host never calls it,
+// and the module then uses the system's own services.
 #pragma once
 
 #include <stdint.h>
@@ -18,7 +19,7 @@ struct VtPlatformHooks {
     const char* executablePath;  // null: the real executable
 };
 
-// Name of the exported function, for dlsym.
+// Name of the exported function, for dlsym and GetProcAddress.
 #define VT_PLATFORM_HOOKS_SYMBOL "VelatoneInstallPlatformHooks"
 typedef void (*VtInstallPlatformHooksProc)(const VtPlatformHooks* hooks);
 

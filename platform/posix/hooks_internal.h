@@ -3,7 +3,7 @@
 
 #include <string>
 
-#include "platform/posix_hooks.h"
+#include "platform/host_hooks.h"
 
 namespace vt::posix {
 

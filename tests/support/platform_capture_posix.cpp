@@ -2,7 +2,7 @@
 
 #include <mutex>
 
-#include "platform/posix_hooks.h"
+#include "platform/host_hooks.h"
 
 extern "C" void VelatoneInstallPlatformHooks(const VtPlatformHooks* hooks);
 
