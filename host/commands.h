@@ -19,17 +19,28 @@ struct CommandContext {
 
 using CommandHandler = PF_Err (*)(const CommandContext& context);
 
-inline constexpr CommandHandler kParamsSetupHandler = nullptr;
-inline constexpr CommandHandler kSequenceSetupHandler = nullptr;
-inline constexpr CommandHandler kSequenceResetupHandler = nullptr;
-inline constexpr CommandHandler kSequenceFlattenHandler = nullptr;
-inline constexpr CommandHandler kSequenceSetdownHandler = nullptr;
-inline constexpr CommandHandler kRenderHandler = nullptr;
-inline constexpr CommandHandler kUserChangedParamHandler = nullptr;
+PF_Err ParamsSetup(const CommandContext& context);
+PF_Err SequenceSetup(const CommandContext& context);
+PF_Err SequenceResetup(const CommandContext& context);
+PF_Err SequenceFlatten(const CommandContext& context);
+PF_Err SequenceSetdown(const CommandContext& context);
+PF_Err Render(const CommandContext& context);
+PF_Err UserChangedParam(const CommandContext& context);
+PF_Err ImportSettings(const CommandContext& context);
+PF_Err SmartPreRender(const CommandContext& context);
+PF_Err SmartRender(const CommandContext& context);
+
+inline constexpr CommandHandler kParamsSetupHandler = ParamsSetup;
+inline constexpr CommandHandler kSequenceSetupHandler = SequenceSetup;
+inline constexpr CommandHandler kSequenceResetupHandler = SequenceResetup;
+inline constexpr CommandHandler kSequenceFlattenHandler = SequenceFlatten;
+inline constexpr CommandHandler kSequenceSetdownHandler = SequenceSetdown;
+inline constexpr CommandHandler kRenderHandler = Render;
+inline constexpr CommandHandler kUserChangedParamHandler = UserChangedParam;
 inline constexpr CommandHandler kEventHandler = nullptr;
-inline constexpr CommandHandler kSettingsImportHandler = nullptr;
+inline constexpr CommandHandler kSettingsImportHandler = ImportSettings;
 inline constexpr CommandHandler kArbitraryCallbackHandler = nullptr;
-inline constexpr CommandHandler kSmartPreRenderHandler = nullptr;
-inline constexpr CommandHandler kSmartRenderHandler = nullptr;
+inline constexpr CommandHandler kSmartPreRenderHandler = SmartPreRender;
+inline constexpr CommandHandler kSmartRenderHandler = SmartRender;
 
 }  // namespace vt
