@@ -12,6 +12,8 @@
 
 #include "resample/resample_internal.h"
 
+#include <immintrin.h>
+
 #include <cstring>
 
 namespace vt::VT_RESAMPLE_NS {
@@ -20,7 +22,6 @@ namespace {
 constexpr int kWidth = VT_RESAMPLE_WIDTH;
 
 typedef float VecF __attribute__((vector_size(kWidth * 4)));
-typedef uint8_t VecB __attribute__((vector_size(kWidth)));
 typedef float Vec4 __attribute__((vector_size(16)));
 typedef int32_t Vec4I __attribute__((vector_size(16)));
 
@@ -40,8 +41,21 @@ inline VecF LoadWide(const float* p) {
     return Load<VecF>(p);
 }
 
+typedef int32_t VecI __attribute__((vector_size(kWidth * 4)));
+
+// Bytes widened by hand: the compiler leaves a generic byte-to-float vector conversion scalar.
+// (The zero-masked forms avoid GCC 12's false uninitialised warning in its AVX-512 header.)
 inline VecF LoadWide(const uint8_t* p) {
-    return __builtin_convertvector(Load<VecB>(p), VecF);
+#if VT_RESAMPLE_WIDTH == 16
+    const VecI i = (VecI)_mm512_maskz_cvtepu8_epi32(0xffff, _mm_loadu_si128(reinterpret_cast<const __m128i*>(p)));
+#elif VT_RESAMPLE_WIDTH == 8
+    const VecI i = (VecI)_mm256_cvtepu8_epi32(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(p)));
+#else
+    const __m128i zero = _mm_setzero_si128();
+    const __m128i bytes = _mm_cvtsi32_si128(Load<int32_t>(p));
+    const VecI i = (VecI)_mm_unpacklo_epi16(_mm_unpacklo_epi8(bytes, zero), zero);
+#endif
+    return __builtin_convertvector(i, VecF);
 }
 
 inline float LoadOne(const float* p) {
@@ -52,26 +66,29 @@ inline float LoadOne(const uint8_t* p) {
     return static_cast<float>(*p);
 }
 
-// row[i] = sum over k of w[k] * source row (first + k)[i], for the n samples of a row.
+// row[i] = sum over k of w[k] * source row (first + k)[i], for the n samples of a row. The row is
+// built in strips that stay in the first-level cache while each source row streams through them
+// in order; every sample still sums its taps in order k = 0, 1, ...
 template <class S>
 void VerticalPass(const ResizeJob& job, uint32_t dy, float* row, size_t n) {
+    constexpr size_t kStrip = 512;
     const uint32_t taps = job.y.taps;
     const float* w = job.y.weights + static_cast<size_t>(dy) * taps;
     const uint8_t* first = job.src + static_cast<ptrdiff_t>(job.y.start[dy]) * job.srcRowBytes;
-    size_t i = 0;
-    for (; i + kWidth <= n; i += kWidth) {
-        VecF acc = w[0] * LoadWide(reinterpret_cast<const S*>(first) + i);
-        for (uint32_t k = 1; k < taps; ++k) {
-            acc = acc + w[k] * LoadWide(reinterpret_cast<const S*>(first + k * job.srcRowBytes) + i);
+    for (size_t begin = 0; begin < n; begin += kStrip) {
+        const size_t end = begin + kStrip < n ? begin + kStrip : n;
+        for (uint32_t k = 0; k < taps; ++k) {
+            const S* in = reinterpret_cast<const S*>(first + k * job.srcRowBytes);
+            const float wk = w[k];
+            size_t i = begin;
+            if (k == 0) {
+                for (; i + kWidth <= end; i += kWidth) Store(row + i, wk * LoadWide(in + i));
+                for (; i < end; ++i) row[i] = wk * LoadOne(in + i);
+            } else {
+                for (; i + kWidth <= end; i += kWidth) Store(row + i, Load<VecF>(row + i) + wk * LoadWide(in + i));
+                for (; i < end; ++i) row[i] = row[i] + wk * LoadOne(in + i);
+            }
         }
-        Store(row + i, acc);
-    }
-    for (; i < n; ++i) {
-        float acc = w[0] * LoadOne(reinterpret_cast<const S*>(first) + i);
-        for (uint32_t k = 1; k < taps; ++k) {
-            acc = acc + w[k] * LoadOne(reinterpret_cast<const S*>(first + k * job.srcRowBytes) + i);
-        }
-        row[i] = acc;
     }
 }
 
