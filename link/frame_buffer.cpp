@@ -73,8 +73,8 @@ void FillRecord(FrameBuffer* frame, uint32_t width, uint32_t height, uint32_t fo
     frame->flags = 0;
 }
 
-// A lock for sections of a few dozen instructions (the module may not use std::mutex: the
-// Windows toolchain's threading model lacks it).
+// A lock for sections of a few dozen instructions; it needs no threading library, which the
+// module does not link.
 class SpinLock {
 public:
     void Lock() {

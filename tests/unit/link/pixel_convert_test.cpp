@@ -115,9 +115,10 @@ TEST(PixelImport, StudioRangeVuyaGivesBt601Colours) {
     EXPECT_EQ(frame.At(3, 2), y / 255);
 
     const float vf = 0.25f, uf = -0.125f, yf = 0.5f;
-    FBImportPixels(Bytes<float>({vf, uf, yf, 1.0f}).data(), 16, kFormatVuyaFloat, &frame.f);
+    Frame one(1, 1);
+    FBImportPixels(Bytes<float>({vf, uf, yf, 1.0f}).data(), 16, kFormatVuyaFloat, &one.f);
     const float yy = yf * 1.1643828f;
-    ExpectPixel(frame, 0, yy + 1.5960274f * vf, yy - 0.39176172f * uf - 0.81296875f * vf, yy + 2.0172305f * uf, yy);
+    ExpectPixel(one, 0, yy + 1.5960274f * vf, yy - 0.39176172f * uf - 0.81296875f * vf, yy + 2.0172305f * uf, yy);
 }
 
 TEST(PixelImport, FourTwoTwoPairsShareChromaWithTheirMatrix) {
