@@ -1,8 +1,11 @@
 #include "refhost/host.h"
 
 #include <cstdio>
+#include <algorithm>
 #include <cstring>
 
+#include "refhost/effect_instance.h"
+#include "sdk/ae_effect_ui.h"
 #include "sdk/ae_suites.h"
 
 namespace refhost {
@@ -23,6 +26,65 @@ A_u_longlong HostGetHandleSize(PF_Handle handle) { return Current().heap().Size(
 PF_Err HostResizeHandle(A_u_longlong size, PF_Handle* handle) {
     if (!handle) return PF_Err_BAD_CALLBACK_PARAM;
     return Current().heap().Resize(*handle, static_cast<size_t>(size)) ? PF_Err_NONE : PF_Err_OUT_OF_MEMORY;
+}
+
+// ---- interaction callbacks
+
+CallContext* ContextOf(PF_ProgPtr effect_ref) { return reinterpret_cast<CallContext*>(effect_ref); }
+
+PF_Err HostAddParam(PF_ProgPtr effect_ref, PF_ParamIndex index, PF_ParamDefPtr def) {
+    CallContext* context = ContextOf(effect_ref);
+    if (!context || !context->host || !def) return PF_Err_BAD_CALLBACK_PARAM;
+    return context->host->AddParam(index, def);
+}
+
+PF_Err HostRegisterUi(PF_ProgPtr effect_ref, PF_CustomUIInfo* info) {
+    CallContext* context = ContextOf(effect_ref);
+    if (!context || !context->host || !info) return PF_Err_BAD_CALLBACK_PARAM;
+    return context->host->RegisterUi(info);
+}
+
+PF_Err CheckoutParam(PF_ProgPtr effect_ref, PF_ParamIndex index, A_long, A_long, A_u_long, PF_ParamDef* param) {
+    CallContext* context = ContextOf(effect_ref);
+    if (!context || !context->instance || !param) return PF_Err_BAD_CALLBACK_PARAM;
+    return context->instance->CheckoutParam(index, param, context->job);
+}
+
+PF_Err CheckinParam(PF_ProgPtr effect_ref, PF_ParamDef* param) {
+    CallContext* context = ContextOf(effect_ref);
+    if (!context || !context->instance || !param) return PF_Err_BAD_CALLBACK_PARAM;
+    return context->instance->CheckinParam(param, context->job);
+}
+
+// fill: a null colour fills with zero (transparent black) pixels, a null rectangle the whole world.
+PF_Err Fill(PF_ProgPtr effect_ref, const PF_Pixel* color, const PF_Rect* rect, PF_EffectWorld* world) {
+    CallContext* context = ContextOf(effect_ref);
+    if (!context || !world) return PF_Err_BAD_CALLBACK_PARAM;
+    WorldLayout layout = WorldLayout::kArgb8;
+    if (!context->host->WorldLayoutOf(world, &layout)) {
+        layout = (world->world_flags & PF_WorldFlag_DEEP) ? WorldLayout::kArgb16 : WorldLayout::kArgb8;
+    }
+    const PF_Rect whole = {0, 0, world->width, world->height};
+    PF_Rect area = rect ? *rect : whole;
+    area.left = std::max(area.left, 0);
+    area.top = std::max(area.top, 0);
+    area.right = std::min(area.right, world->width);
+    area.bottom = std::min(area.bottom, world->height);
+    const uint32_t bytes = LayoutBytesPerPixel(layout);
+    for (A_long y = area.top; y < area.bottom; ++y) {
+        auto* row = reinterpret_cast<uint8_t*>(world->data) + static_cast<ptrdiff_t>(y) * world->rowbytes;
+        for (A_long x = area.left; x < area.right; ++x) {
+            uint8_t* pixel = row + static_cast<size_t>(x) * bytes;
+            if (!color) {
+                std::memset(pixel, 0, bytes);
+            } else if (layout == WorldLayout::kArgb8) {
+                pixel[0] = color->alpha, pixel[1] = color->red, pixel[2] = color->green, pixel[3] = color->blue;
+            } else {
+                return PF_Err_BAD_CALLBACK_PARAM;  // coloured fills of deep worlds are not needed here
+            }
+        }
+    }
+    return PF_Err_NONE;
 }
 
 // ---- the suite directory
@@ -99,6 +161,11 @@ AEGP_MemorySuite1 MakeMemorySuite() {
 
 PF_Err WorldGetPixelFormat(const PF_EffectWorld* world, PF_PixelFormat* format) {
     if (!world || !format) return PF_Err_BAD_CALLBACK_PARAM;
+    WorldLayout layout;
+    if (Current().WorldLayoutOf(world, &layout)) {
+        *format = WorldSuiteAnswer(layout);
+        return *format ? PF_Err_NONE : PF_Err_BAD_CALLBACK_PARAM;
+    }
     *format = (world->world_flags & PF_WorldFlag_DEEP) ? PF_PixelFormat_ARGB64 : PF_PixelFormat_ARGB32;
     return PF_Err_NONE;
 }
@@ -121,8 +188,10 @@ PF_Err ClearSupportedPixelFormats(PF_ProgPtr) {
 }
 PF_Err PixelFormatGetPixelFormat(PF_EffectWorld* world, PrPixelFormat* format) {
     if (!world || !format) return PF_Err_BAD_CALLBACK_PARAM;
-    *format = PrPixelFormat_BGRA_4444_8u;
-    return PF_Err_NONE;
+    WorldLayout layout;
+    // A world the host did not make reads as its most common layout.
+    *format = Current().WorldLayoutOf(world, &layout) ? PixelFormatSuiteAnswer(layout) : PrPixelFormat_BGRA_4444_8u;
+    return *format ? PF_Err_NONE : PF_Err_BAD_CALLBACK_PARAM;
 }
 
 PF_PixelFormatSuite1 MakePixelFormatSuite() {
@@ -189,10 +258,15 @@ Host::Host(HostPersona persona) : m_persona(std::move(persona)) {
     m_utils.host_dispose_handle = HostDisposeHandle;
     m_utils.host_get_handle_size = HostGetHandleSize;
     m_utils.host_resize_handle = HostResizeHandle;
+    m_utils.fill = Fill;
+    m_setupContext = {this, nullptr, nullptr};
     InitInData();
 }
 
 Host::~Host() {
+    for (PF_ParamDef& def : m_paramDefs) {
+        if (def.param_type == PF_Param_ARBITRARY_DATA) m_heap.Dispose(def.u.arb_d.dephault);
+    }
     UnloadModule();
     if (g_current == this) g_current = nullptr;
 }
@@ -200,7 +274,11 @@ Host::~Host() {
 void Host::InitInData() {
     m_inData = PF_InData{};
     m_inData.utils = &m_utils;
-    m_inData.effect_ref = reinterpret_cast<PF_ProgPtr>(this);
+    m_inData.effect_ref = reinterpret_cast<PF_ProgPtr>(&m_setupContext);
+    m_inData.inter.add_param = HostAddParam;
+    m_inData.inter.register_ui = HostRegisterUi;
+    m_inData.inter.checkout_param = CheckoutParam;
+    m_inData.inter.checkin_param = CheckinParam;
     m_inData.quality = PF_Quality_HI;
     m_inData.version.major = m_persona.apiMajor;
     m_inData.version.minor = m_persona.apiMinor;
@@ -266,6 +344,73 @@ PF_Err Host::Call(PF_Cmd cmd, PF_ParamDef** params, PF_LayerDef* output, void* e
     g_current = this;
     if (!m_entry) return PF_Err_INVALID_CALLBACK;
     return m_entry(cmd, &m_inData, &m_outData, params, output, extra);
+}
+
+PF_InData Host::MakeInData(CallContext* context, PF_Handle sequence) const {
+    PF_InData inData = m_inData;
+    inData.effect_ref = reinterpret_cast<PF_ProgPtr>(context);
+    inData.sequence_data = sequence;
+    inData.num_params = static_cast<A_long>(m_paramDefs.size());
+    return inData;
+}
+
+PF_Err Host::CallWith(PF_InData* inData, PF_Cmd cmd, PF_ParamDef** params, PF_LayerDef* output, void* extra) {
+    g_current = this;
+    if (!m_entry) return PF_Err_INVALID_CALLBACK;
+    PF_OutData out = m_outData;
+    out.sequence_data = nullptr;
+    const PF_Err err = m_entry(cmd, inData, &out, params, output, extra);
+    m_lastOutSequence = out.sequence_data;
+    m_lastOutFlags = out.out_flags;
+    return err;
+}
+
+PF_Err Host::ParamsSetup() {
+    for (PF_ParamDef& def : m_paramDefs) {
+        if (def.param_type == PF_Param_ARBITRARY_DATA) m_heap.Dispose(def.u.arb_d.dephault);
+    }
+    m_paramDefs.assign(1, PF_ParamDef{});
+    m_paramIds.assign(1, 0);
+    m_paramDefs[0].param_type = PF_Param_LAYER;
+    m_uiRegistrations = 0;
+    m_outData.num_params = 0;
+    const PF_Err err = Call(PF_Cmd_PARAMS_SETUP);
+    m_declaredParamCount = m_outData.num_params;
+    return err;
+}
+
+PF_Err Host::AddParam(PF_ParamIndex index, const PF_ParamDef* def) {
+    if (index != -1) return PF_Err_BAD_CALLBACK_PARAM;  // only appending is offered
+    PF_ParamDef copy = *def;
+    // The id is read at declaration; afterwards the same field carries the change flags.
+    m_paramIds.push_back(static_cast<uint32_t>(copy.uu.id));
+    copy.uu.change_flags = PF_ChangeFlag_NONE;
+    m_paramDefs.push_back(copy);
+    return PF_Err_NONE;
+}
+
+PF_Err Host::RegisterUi(const PF_CustomUIInfo* info) {
+    if (info->events != PF_CustomEFlag_EFFECT) return PF_Err_BAD_CALLBACK_PARAM;
+    ++m_uiRegistrations;
+    return PF_Err_NONE;
+}
+
+void Host::RegisterWorld(const PF_EffectWorld* world, WorldLayout layout) {
+    std::lock_guard<std::mutex> guard(m_worldMutex);
+    m_worlds[world] = layout;
+}
+
+void Host::UnregisterWorld(const PF_EffectWorld* world) {
+    std::lock_guard<std::mutex> guard(m_worldMutex);
+    m_worlds.erase(world);
+}
+
+bool Host::WorldLayoutOf(const PF_EffectWorld* world, WorldLayout* layout) const {
+    std::lock_guard<std::mutex> guard(m_worldMutex);
+    auto found = m_worlds.find(world);
+    if (found == m_worlds.end()) return false;
+    *layout = found->second;
+    return true;
 }
 
 PF_Err Host::GlobalSetup() {

@@ -12,12 +12,23 @@
 #include <vector>
 
 #include "refhost/handles.h"
+#include "refhost/world.h"
 #include "refhost/persona.h"
 #include "refhost/module_file.h"
 #include "sdk/ae_effect.h"
 #include "sdk/sp_basic.h"
 
 namespace refhost {
+
+class EffectInstance;
+struct RenderJob;
+
+// What a callback's effect_ref points at: the host, and the instance and render it is made for.
+struct CallContext {
+    class Host* host;
+    EffectInstance* instance;
+    RenderJob* job;
+};
 
 struct Message {
     int kind;  // 1 warning, 2 error, 3 information, other: no icon
@@ -79,6 +90,31 @@ public:
     // Test controls.
     void SetSuiteOffered(const std::string& name, int32_t version, bool offered);
 
+    // PF_Cmd_PARAMS_SETUP: the effect declares its parameters; they are kept as the effect's
+    // definitions, from which every instance takes its own values.
+    PF_Err ParamsSetup();
+    const std::vector<PF_ParamDef>& paramDefs() const { return m_paramDefs; }
+    // The stable id each parameter was declared with, by host index.
+    const std::vector<uint32_t>& paramIds() const { return m_paramIds; }
+    int uiRegistrations() const { return m_uiRegistrations; }
+    int32_t declaredParamCount() const { return m_declaredParamCount; }
+    // The in-data a call for this instance and render uses (its own copy, so calls on several
+    // threads do not share one).
+    PF_InData MakeInData(CallContext* context, PF_Handle sequence) const;
+    PF_Err CallWith(PF_InData* inData, PF_Cmd cmd, PF_ParamDef** params, PF_LayerDef* output, void* extra);
+    // What the last CallWith left in its out-data.
+    PF_Handle lastOutSequence() const { return m_lastOutSequence; }
+    PF_OutFlags lastOutFlags() const { return m_lastOutFlags; }
+
+    // Worlds the host hands out, with the layout its suites report for them.
+    void RegisterWorld(const PF_EffectWorld* world, WorldLayout layout);
+    void UnregisterWorld(const PF_EffectWorld* world);
+    bool WorldLayoutOf(const PF_EffectWorld* world, WorldLayout* layout) const;
+
+    // Interaction callbacks land here.
+    PF_Err AddParam(PF_ParamIndex index, const PF_ParamDef* def);
+    PF_Err RegisterUi(const PF_CustomUIInfo* info);
+
     // The module's callbacks land here (through static trampolines).
     SPErr AcquireSuite(const char* name, int32_t version, const void** suite);
     SPErr ReleaseSuite(const char* name, int32_t version);
@@ -105,6 +141,16 @@ private:
     std::vector<PiplEntry> m_properties;
     std::string m_entryPointName;
     PF_FilterProc m_entry = nullptr;
+
+    CallContext m_setupContext{};
+    std::vector<PF_ParamDef> m_paramDefs;  // index 0 is the input layer
+    std::vector<uint32_t> m_paramIds;
+    int m_uiRegistrations = 0;
+    int32_t m_declaredParamCount = 0;
+    mutable std::mutex m_worldMutex;  // guards m_worlds
+    std::map<const PF_EffectWorld*, WorldLayout> m_worlds;
+    thread_local static inline PF_Handle m_lastOutSequence = nullptr;
+    thread_local static inline PF_OutFlags m_lastOutFlags = 0;
 
     PF_InData m_inData{};
     PF_OutData m_outData{};
