@@ -1,0 +1,455 @@
+// The pixel kernel's body: the fourteen stages over one group of lanes, in their fixed order, each
+// gated by its flag. Included once per processor target (see kernel_simd_internal.h); reads only
+// EngineParams and the tables, allocates nothing and takes no locks.
+//
+// Weighted sums over the three luma ranges are gathered before they are applied (Σ W c_r = c Σ W_r,
+// and likewise for rotations and extrapolated lookups), so each range-weighted stage costs about
+// what one range would; the results equal the per-range sums up to float rounding.
+//
+// Where a formula divides by a pixel's luma or by a limit (highlight compression, soft and hard clip,
+// the composite limits) the division happens only where the divisor is non-zero; elsewhere the
+// pixel passes unchanged. Every table index comes from a value clamped to [0, 1] with NaN sent to 0.
+#pragma once
+
+#include "engine/engine_params.h"
+#include "engine/kernel_paths_internal.h"
+#include "engine/kernel_simd_internal.h"
+
+namespace vt {
+namespace VT_KERNEL_NS {
+namespace {
+
+// Hue wheels are stored Master, Shadows, Midtones, Highlights.
+constexpr int kWheelIndexMaster = 0;
+constexpr int kWheelIndexShadows = 1;
+constexpr int kWheelIndexMidtones = 2;
+constexpr int kWheelIndexHighlights = 3;
+
+struct Pixel {
+    F r, g, b;
+};
+
+struct Yuv {
+    F y, u, v;
+};
+
+// The pixel's luma-range weights, indexed by stored range (1 Highlights, 2 Midtones, 3 Shadows),
+// and their sum.
+struct Weights {
+    F w[4];
+    F sum;
+};
+
+inline F Luma(const Pixel& p) { return Splat(0.299f) * p.r + Splat(0.587f) * p.g + Splat(0.114f) * p.b; }
+
+inline Yuv ToYuv(const Pixel& p) {
+    return {Luma(p), Splat(-0.147407f) * p.r - Splat(0.289391f) * p.g + Splat(0.436798f) * p.b,
+            Splat(0.614777f) * p.r - Splat(0.514799f) * p.g - Splat(0.099978f) * p.b};
+}
+
+inline Pixel FromYuv(F y, F u, F v) {
+    return {y + Splat(1.140251f) * v, y - Splat(0.393931f) * u - Splat(0.580809f) * v, y + Splat(2.028398f) * u};
+}
+
+inline Pixel SelectPixel(M m, const Pixel& a, const Pixel& b) {
+    return {Select(m, a.r, b.r), Select(m, a.g, b.g), Select(m, a.b, b.b)};
+}
+
+inline Pixel Scale(const Pixel& p, F f) { return {p.r * f, p.g * f, p.b * f}; }
+
+// [0, 1] with NaN sent to 0.
+inline F ClampUnit(F v) { return Min(Max(v, Splat(0.0f)), Splat(1.0f)); }
+
+inline I IndexOf(F v) { return ToIndex(ClampUnit(v)); }
+
+// Truncating lookup up to level 1, the end value plus the end slope beyond it. Branch-free: in
+// ordinary footage some lanes of most groups lie above 1, in no predictable way.
+inline F LookupExtrapolated(const ExtrapolatedTable& t, F v) {
+    const F inside = Gather(t.table, IndexOf(v));
+    return Select(v > Splat(1.0f), v * Splat(t.slope) + Splat(t.base), inside);
+}
+
+// Σ W_r L_r(v) over Highlights, Midtones and Shadows, for tables read at the same level.
+inline F WeightedLookup(const ExtrapolatedTable* tables, const Weights& w, F v) {
+    const I index = IndexOf(v);
+    const F inside = w.w[1] * Gather(tables[1].table, index) + w.w[2] * Gather(tables[2].table, index) +
+                     w.w[3] * Gather(tables[3].table, index);
+    const F slope = w.w[1] * Splat(tables[1].slope) + w.w[2] * Splat(tables[2].slope) + w.w[3] * Splat(tables[3].slope);
+    const F base = w.w[1] * Splat(tables[1].base) + w.w[2] * Splat(tables[2].base) + w.w[3] * Splat(tables[3].base);
+    return Select(v > Splat(1.0f), v * slope + base, inside);
+}
+
+inline F WeightedSum(const Weights& w, const float* values) {
+    return w.w[1] * Splat(values[1]) + w.w[2] * Splat(values[2]) + w.w[3] * Splat(values[3]);
+}
+
+// HSL saturation. Grey pixels, pixels with L <= 0 and pixels whose max + min is exactly 2 (where the
+// upper formula would divide by zero) have saturation 0.
+inline F HslSaturation(F mx, F mn) {
+    const F sum = mx + mn;
+    const M low = sum <= Splat(1.0f);  // L <= 0.5
+    const F denominator = Select(low, sum, Splat(2.0f) - sum);
+    const M zero = (mx == mn) | (sum <= Splat(0.0f)) | (denominator == Splat(0.0f));
+    return Select(zero, Splat(0.0f), (mx - mn) / Select(zero, Splat(1.0f), denominator));
+}
+
+inline F MaxOf(const Pixel& p) { return Max(Max(p.r, p.g), p.b); }
+inline F MinOf(const Pixel& p) { return Min(Min(p.r, p.g), p.b); }
+
+// The vibrance cap: 2.1 for a grey pixel, 1 for a fully saturated one.
+inline F VibranceCap(const Pixel& p) {
+    return Splat(2.1f) - Splat(1.1f) * HslSaturation(MaxOf(p), MinOf(p));
+}
+
+inline Pixel LoadPixel(const KernelPlanes& planes, size_t i) {
+    return {Load(planes.source[0] + i), Load(planes.source[1] + i), Load(planes.source[2] + i)};
+}
+
+inline Weights RangeWeights(const EngineParams& p, const Pixel& px) {
+    const I index = IndexOf(Luma(px));
+    Weights w;
+    w.w[0] = Splat(0.0f);
+    w.w[1] = Gather(p.weightHighlights, index);
+    w.w[2] = Gather(p.weightMidtones, index);
+    w.w[3] = Gather(p.weightShadows, index);
+    w.sum = w.w[1] + w.w[2] + w.w[3];
+    return w;
+}
+
+inline void ApplyAutoCompression(const EngineParams& p, Pixel& px) {
+    const F y = Luma(px);
+    const F knee = Splat(p.autoKnee);
+    const M m = (y >= knee) & (y != Splat(0.0f));
+    if (!Any(m)) return;
+    const F f = ((y - knee) * Splat(0.5f) + knee) / Select(m, y, Splat(1.0f));
+    px = SelectPixel(m, Scale(px, f), px);
+}
+
+inline void ApplyLevelsInput(const EngineParams& p, Pixel& px) {
+    px = {px.r * Splat(p.levelsSlope[0]) + Splat(p.levelsOffset[0]),
+          px.g * Splat(p.levelsSlope[1]) + Splat(p.levelsOffset[1]),
+          px.b * Splat(p.levelsSlope[2]) + Splat(p.levelsOffset[2])};
+    if (p.flags.levelsGamma) {
+        px = {LookupExtrapolated(p.levels[0], px.r), LookupExtrapolated(p.levels[1], px.g),
+              LookupExtrapolated(p.levels[2], px.b)};
+    }
+}
+
+// c <- c f + Y (weight - f) for every channel: saturation and vibrance, weighted or not.
+inline Pixel MixWithLuma(const Pixel& px, F f, F lumaPart) {
+    return {px.r * f + lumaPart, px.g * f + lumaPart, px.b * f + lumaPart};
+}
+
+inline void ApplyTonalRanges(const EngineParams& p, const Weights& w, Pixel& px) {
+    const StageFlags& f = p.flags;
+    if (f.tonalHueRotation) {
+        const Yuv yuv = ToYuv(px);
+        const F cs = WeightedSum(w, p.tonalCos);
+        const F sn = WeightedSum(w, p.tonalSin);
+        px = FromYuv(yuv.y * w.sum, yuv.u * cs - yuv.v * sn, yuv.u * sn + yuv.v * cs);
+    }
+    if (f.tonalGain) px = Scale(px, WeightedSum(w, p.tonalGain));
+    if (f.tonalPedestal) {
+        const F pedestal = WeightedSum(w, p.tonalPedestal);
+        px = {px.r + pedestal, px.g + pedestal, px.b + pedestal};
+    }
+    if (f.tonalCurve) {
+        px = {WeightedLookup(p.tonal, w, px.r), WeightedLookup(p.tonal, w, px.g), WeightedLookup(p.tonal, w, px.b)};
+    }
+    if (f.tonalSaturation) {
+        const F s = WeightedSum(w, p.tonalSaturation);
+        px = MixWithLuma(px, s, Luma(px) * (w.sum - s));
+    }
+    if (f.tonalVibrance) {
+        const F cap = VibranceCap(px);
+        const F factor = w.w[1] * Min(Splat(p.tonalVibrance[1]), cap) + w.w[2] * Min(Splat(p.tonalVibrance[2]), cap) +
+                         w.w[3] * Min(Splat(p.tonalVibrance[3]), cap);
+        px = MixWithLuma(px, factor, Luma(px) * (w.sum - factor));
+    }
+}
+
+inline void ApplyTonalMaster(const EngineParams& p, Pixel& px) {
+    const StageFlags& f = p.flags;
+    if (f.masterHueRotation) {
+        const Yuv yuv = ToYuv(px);
+        const F cs = Splat(p.tonalCos[0]);
+        const F sn = Splat(p.tonalSin[0]);
+        px = FromYuv(yuv.y, yuv.u * cs - yuv.v * sn, yuv.u * sn + yuv.v * cs);
+    }
+    const F gain = Splat(p.tonalGain[0]);
+    const F pedestal = Splat(p.tonalPedestal[0]);
+    px = {px.r * gain + pedestal, px.g * gain + pedestal, px.b * gain + pedestal};
+    if (f.masterCurve) {
+        const ExtrapolatedTable& t = p.tonal[0];
+        px = {LookupExtrapolated(t, px.r), LookupExtrapolated(t, px.g), LookupExtrapolated(t, px.b)};
+    }
+    if (f.masterSaturation) {
+        px = MixWithLuma(px, Splat(p.tonalSaturation[0]), Luma(px) * Splat(p.tonalDesaturation[0]));
+    }
+    if (f.masterVibrance) {
+        const F factor = Min(Splat(p.tonalVibrance[0]), VibranceCap(px));
+        px = MixWithLuma(px, factor, Luma(px) * (Splat(1.0f) - factor));
+    }
+}
+
+inline void PullTowardsWheel(const EngineParams& p, int wheel, F weight, F& u, F& v) {
+    if (!p.flags.wheelActive[wheel]) return;
+    const F t = Splat(p.wheelGain[wheel]) * weight;
+    u = u + (Splat(p.wheelU[wheel]) - u) * t;
+    v = v + (Splat(p.wheelV[wheel]) - v) * t;
+}
+
+inline void ApplyHueWheels(const EngineParams& p, const Weights& w, Pixel& px) {
+    Yuv yuv = ToYuv(px);
+    PullTowardsWheel(p, kWheelIndexShadows, w.w[3], yuv.u, yuv.v);
+    PullTowardsWheel(p, kWheelIndexMidtones, w.w[2], yuv.u, yuv.v);
+    PullTowardsWheel(p, kWheelIndexHighlights, w.w[1], yuv.u, yuv.v);
+    PullTowardsWheel(p, kWheelIndexMaster, Splat(1.0f), yuv.u, yuv.v);
+    px = FromYuv(yuv.y, yuv.u, yuv.v);
+}
+
+inline F SetRangesChannel(const EngineParams& p, int set, int c, const Weights& w, F v) {
+    const F gain = w.w[1] * Splat(p.setGain[set][1][c]) + w.w[2] * Splat(p.setGain[set][2][c]) +
+                   w.w[3] * Splat(p.setGain[set][3][c]);
+    const F pedestal = w.w[1] * Splat(p.setPedestal[set][1][c]) + w.w[2] * Splat(p.setPedestal[set][2][c]) +
+                       w.w[3] * Splat(p.setPedestal[set][3][c]);
+    v = v * gain + pedestal;
+    if (!p.flags.setRangesGamma[set]) return v;
+    const ExtrapolatedTable tables[4] = {{}, p.setGamma[set][1][c], p.setGamma[set][2][c], p.setGamma[set][3][c]};
+    return WeightedLookup(tables, w, v);
+}
+
+inline F SetMasterChannel(const EngineParams& p, int set, int c, F v) {
+    v = v * Splat(p.setGain[set][0][c]) + Splat(p.setPedestal[set][0][c]);
+    return p.flags.setMasterGamma[set] ? LookupExtrapolated(p.setGamma[set][0][c], v) : v;
+}
+
+inline void ApplyChannelSets(const EngineParams& p, const Weights& w, Pixel& px) {
+    for (int set = 0; set < kChannelSetCount; ++set) {
+        if (p.flags.setRanges[set]) {
+            px = {SetRangesChannel(p, set, 0, w, px.r), SetRangesChannel(p, set, 1, w, px.g),
+                  SetRangesChannel(p, set, 2, w, px.b)};
+        }
+    }
+    for (int set = 0; set < kChannelSetCount; ++set) {
+        if (p.flags.setMaster[set]) {
+            px = {SetMasterChannel(p, set, 0, px.r), SetMasterChannel(p, set, 1, px.g), SetMasterChannel(p, set, 2, px.b)};
+        }
+    }
+}
+
+inline void ApplyToneCurves(const EngineParams& p, Pixel& px) {
+    px = {LookupExtrapolated(p.toneCurve[0], px.r), LookupExtrapolated(p.toneCurve[1], px.g),
+          LookupExtrapolated(p.toneCurve[2], px.b)};
+}
+
+// One channel of HSL to RGB: t wraps once into [0, 1], then the piecewise hue function.
+inline F HueChannel(F p, F qp, F q, F t) {
+    t = Select(t < Splat(0.0f), t + Splat(1.0f), Select(t > Splat(1.0f), t - Splat(1.0f), t));
+    const F six = Splat(6.0f) * t;
+    const F rising = p + qp * six;
+    const F falling = p + qp * (Splat(4.0f) - six);  // (2/3 - t) 6
+    return Select(six < Splat(1.0f), rising, Select(six < Splat(3.0f), q, Select(six < Splat(4.0f), falling, p)));
+}
+
+inline void ApplyHueCurves(const EngineParams& p, Pixel& px) {
+    const F mx = MaxOf(px);
+    const F mn = MinOf(px);
+    const F lightness = (mx + mn) * Splat(0.5f);
+    const F saturation = HslSaturation(mx, mn);
+    const M grey = mx == mn;
+    const F inverseD = Splat(1.0f) / Select(grey, Splat(1.0f), mx - mn);
+    F hr = (px.g - px.b) * inverseD + Splat(6.0f);
+    hr = Select(hr >= Splat(6.0f), hr - Splat(6.0f), hr);
+    const F hg = (px.b - px.r) * inverseD + Splat(2.0f);
+    const F hb = (px.r - px.g) * inverseD + Splat(4.0f);
+    const M redMax = px.r == mx;
+    const M greenMax = AndNot(px.g == mx, redMax);
+    const F sector = Select(redMax, hr, Select(greenMax, hg, hb));
+    const F hue = Select(grey, Splat(0.0f), sector * Splat(1.0f / 6.0f));
+
+    // The curves are drawn from cyan to cyan: position 0.5 is red.
+    F position = hue + Splat(0.5f);
+    position = Select(position > Splat(1.0f), position - Splat(1.0f), position);
+    const I index = IndexOf(position);
+    const F h2 = hue + Gather(p.hueShift, index);
+    const F s2 = saturation * Gather(p.hueSaturation, index);
+    const F l2 = lightness * Gather(p.hueLuma, index);
+
+    const F q = Select(l2 < Splat(0.5f), (s2 + Splat(1.0f)) * l2, l2 + s2 - l2 * s2);
+    const F pp = Splat(2.0f) * l2 - q;
+    const F qp = q - pp;
+    const Pixel coloured{HueChannel(pp, qp, q, h2 + Splat(1.0f / 3.0f)), HueChannel(pp, qp, q, h2),
+                         HueChannel(pp, qp, q, h2 - Splat(1.0f / 3.0f))};
+    px = SelectPixel(s2 == Splat(0.0f), Pixel{l2, l2, l2}, coloured);
+}
+
+inline void ApplyLevelsOutput(const EngineParams& p, Pixel& px) {
+    px = {px.r * Splat(p.levelsRange[0]) + Splat(p.levelsOutputOffset[0]),
+          px.g * Splat(p.levelsRange[1]) + Splat(p.levelsOutputOffset[1]),
+          px.b * Splat(p.levelsRange[2]) + Splat(p.levelsOutputOffset[2])};
+}
+
+inline F SecondaryKey(const SecondaryParams& s, const Yuv& yuv) {
+    const F inverseSoftness2 = Splat(s.inverseSoftness2);
+    F key = Splat(0.0f);
+    for (int j = 0; j < 4; ++j) {
+        if (!s.referenceEnable[j]) continue;
+        const F du = Splat(s.referenceU[j]) - yuv.u;
+        const F dv = Splat(s.referenceV[j]) - yuv.v;
+        const F chroma = ClampUnit(Splat(s.chromaKeyBase) - (du * du + dv * dv) * inverseSoftness2);
+        const F luma = ClampUnit(Splat(s.lumaKeyBase) - Abs(Splat(s.referenceY[j]) - yuv.y) * inverseSoftness2);
+        key = Max(key, chroma * luma);
+    }
+    return key;
+}
+
+inline void ApplySecondary(const EngineParams& p, int k, Pixel& px) {
+    const SecondaryParams& s = p.secondary[k];
+    const Yuv yuv = ToYuv(px);
+    const F key = SecondaryKey(s, yuv);
+
+    Yuv corrected;
+    Yuv uncorrected;
+    switch (s.mode) {
+        case 1:
+            corrected = yuv;
+            uncorrected = {yuv.y, Splat(0.0f), Splat(0.0f)};
+            break;
+        case 2:
+            corrected = yuv;
+            uncorrected = ToYuv(Pixel{Max(px.r, Splat(0.6825f)), Splat(0.6825f) * px.g, Splat(0.6825f) * px.b});
+            break;
+        case 3:
+            corrected = {Splat(1.0f), Splat(0.0f), Splat(0.0f)};
+            uncorrected = {Splat(0.0f), Splat(0.0f), Splat(0.0f)};
+            break;
+        default: {
+            F y1 = yuv.y * Splat(s.gain) + Splat(s.pedestal);
+            if (s.gammaActive) y1 = LookupExtrapolated(p.secondaryGamma[k], y1);
+            const F cs = Splat(s.cosMix);
+            const F sn = Splat(s.sinMix);
+            corrected = {y1, yuv.u * cs - yuv.v * sn + Splat(s.shiftMixU), yuv.u * sn + yuv.v * cs + Splat(s.shiftMixV)};
+            uncorrected = yuv;
+            break;
+        }
+    }
+    // Without inversion the key selects the corrected colour, with it the uncorrected one.
+    const Yuv& from = s.invert ? corrected : uncorrected;
+    const Yuv& to = s.invert ? uncorrected : corrected;
+    px = FromYuv(from.y + (to.y - from.y) * key, from.u + (to.u - from.u) * key, from.v + (to.v - from.v) * key);
+}
+
+inline void ApplySecondaries(const EngineParams& p, Pixel& px) {
+    for (int k = 0; k < 6; ++k) {
+        if (p.flags.secondary[k]) ApplySecondary(p, k, px);
+    }
+}
+
+// Scales the pixel by numerator / y where y reaches the level (and is not 0).
+inline void ClipAt(Pixel& px, F y, M reached, F numerator) {
+    const M m = reached & (y != Splat(0.0f));
+    if (!Any(m)) return;
+    px = SelectPixel(m, Scale(px, numerator / Select(m, y, Splat(1.0f))), px);
+}
+
+inline void ApplyLimiter(const EngineParams& p, Pixel& px) {
+    F y = Luma(px);
+    if (p.flags.softClip) {
+        const F knee = Splat(p.softKnee);
+        ClipAt(px, y, y >= knee, (y - knee) * Splat(p.softRatio) + knee);
+        y = Luma(px);
+    }
+    const F hard = Splat(p.hardClip);
+    ClipAt(px, y, y >= hard, hard);
+
+    const F zero = Splat(0.0f);
+    const F one = Splat(1.0f);
+    const F hundred = Splat(100.0f);
+    const F hundredth = Splat(0.01f);
+    const bool preview = p.flags.limiterPreview != 0;
+    const uint32_t method = p.limitMethod;
+    for (int side = 0; side < 2; ++side) {
+        const Yuv yuv = ToYuv(px);
+        const F u = yuv.u * hundred;
+        const F v = yuv.v * hundred;
+        const F q = Sqrt(Max(u * u + v * v, one));
+        const F limit = Splat(side == 0 ? p.compositeMax : p.compositeMin);
+        // top = 100 Y + Q must stay below the upper limit, bottom = 100 Y - Q above the lower one.
+        const F level = side == 0 ? hundred * yuv.y + q : hundred * yuv.y - q;
+        const M outside = side == 0 ? level >= limit : level <= limit;
+        if (!Any(outside)) continue;
+        if (preview) {
+            px = SelectPixel(outside, Pixel{zero, zero, zero}, px);
+        } else if (method == 2) {
+            const M m = outside & (level != zero);
+            px = SelectPixel(m, Scale(px, limit / Select(m, level, one)), px);
+        } else if (method == 1 || method == 3) {
+            // The lower factor is bounded at 0 like the upper one, so the chroma of very dark pixels
+            // is removed rather than inverted.
+            const F excess = side == 0 ? level - limit : limit - level;
+            const F share = (side == 0 && method == 3) ? Splat(0.4f) * excess : excess;
+            const F f = Max((q - share) / q, zero) * hundredth;
+            Pixel reduced = FromYuv(yuv.y, f * u, f * v);
+            if (side == 0 && method == 3) {
+                // Smart Limit also scales by the limit over the level; a zero level keeps the
+                // reduced chroma unscaled.
+                const M nonZero = level != zero;
+                reduced = SelectPixel(nonZero, Scale(reduced, limit / Select(nonZero, level, one)), reduced);
+            }
+            px = SelectPixel(outside, reduced, px);
+        }
+    }
+}
+
+inline void StorePixel(const KernelPlanes& planes, size_t i, const Pixel& px) {
+    Store(planes.destination[0] + i, px.r);
+    Store(planes.destination[1] + i, px.g);
+    Store(planes.destination[2] + i, px.b);
+    Store(planes.destination[3] + i, Luma(px));
+}
+
+inline Pixel CorrectPixel(const EngineParams& p, Pixel px) {
+    const StageFlags& f = p.flags;
+    Weights w{};
+    if (f.rangeWeights) w = RangeWeights(p, px);
+    if (f.autoCompress) ApplyAutoCompression(p, px);
+    if (f.levels) ApplyLevelsInput(p, px);
+    if (f.tonalRanges) ApplyTonalRanges(p, w, px);
+    if (f.tonalMaster) ApplyTonalMaster(p, px);
+    if (f.hueWheels) ApplyHueWheels(p, w, px);
+    ApplyChannelSets(p, w, px);
+    if (f.toneCurves) ApplyToneCurves(p, px);
+    if (f.hueCurves) ApplyHueCurves(p, px);
+    if (f.levels) ApplyLevelsOutput(p, px);
+    if (f.secondaries) ApplySecondaries(p, px);
+    if (f.limiter) ApplyLimiter(p, px);
+    return px;
+}
+
+}  // namespace
+
+void CorrectPlanes(const EngineParams& params, const KernelPlanes& planes) {
+    // A local copy of the block: nothing the loop stores can alias it, so its values may stay in
+    // registers across groups.
+    const EngineParams p = params;
+    const size_t full = planes.count - planes.count % kLanes;
+    for (size_t i = 0; i < full; i += kLanes) StorePixel(planes, i, CorrectPixel(p, LoadPixel(planes, i)));
+
+    // The last few floats of a plane whose length is not a whole group: through a padded group.
+    const size_t rest = planes.count - full;
+    if (rest == 0) return;
+    float in[3][kLanes] = {};
+    float out[4][kLanes] = {};
+    for (int c = 0; c < 3; ++c) {
+        for (size_t l = 0; l < rest; ++l) in[c][l] = planes.source[c][full + l];
+    }
+    const KernelPlanes tail{{in[0], in[1], in[2]}, {out[0], out[1], out[2], out[3]}, kLanes};
+    StorePixel(tail, 0, CorrectPixel(p, LoadPixel(tail, 0)));
+    for (int c = 0; c < 4; ++c) {
+        for (size_t l = 0; l < rest; ++l) planes.destination[c][full + l] = out[c][l];
+    }
+}
+
+}  // namespace VT_KERNEL_NS
+}  // namespace vt
