@@ -2,6 +2,7 @@
 // the object, in tests that link the platform layer directly.
 #pragma once
 
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -10,6 +11,13 @@ namespace vt::test {
 struct CapturedMessage {
     int kind;
     std::string text;
+};
+
+// One file dialog the code under test showed.
+struct CapturedDialog {
+    bool save;
+    std::string filter;  // description|pattern pairs
+    std::string title;
 };
 
 class PlatformCapture {
@@ -23,6 +31,10 @@ public:
     std::vector<std::string> DebugLines() const;
     // Presents another process identity to the module code under test.
     void SetIdentity(const std::string& commandLine, const std::string& executablePath);
+    // Answers the coming file dialogs in turn: a path, or nullopt for cancel. Dialogs beyond the
+    // script are cancelled.
+    void ScriptFileDialogs(const std::vector<std::optional<std::string>>& answers);
+    std::vector<CapturedDialog> FileDialogs() const;
 };
 
 }  // namespace vt::test
