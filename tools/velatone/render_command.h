@@ -1,0 +1,38 @@
+// `velatone render` grades image files through the module as a host would; `velatone params`
+// prints the parameters as a host panel shows them.
+#pragma once
+
+#include <string>
+#include <vector>
+
+namespace CLI {
+class App;
+}
+
+namespace velatone {
+
+struct RenderOptions {
+    std::string input;
+    std::string output;
+    std::string modulePath;
+    std::string host = "aftereffects";
+    std::string api;
+    std::string settingsFile;
+    std::string saveSettings;
+    std::string layout = "argb";
+    int depth = 0;  // 0: the input image's own
+    bool classic = false;
+    std::vector<std::string> sets;
+};
+
+struct ParamsOptions {
+    std::string modulePath;
+    std::string host = "aftereffects";
+};
+
+void AddRenderCommand(CLI::App& app, RenderOptions& options);
+int RunRender(const RenderOptions& options);
+void AddParamsCommand(CLI::App& app, ParamsOptions& options);
+int RunParams(const ParamsOptions& options);
+
+}  // namespace velatone
