@@ -4,7 +4,9 @@
 #include "engine/curves.h"
 
 #include <cmath>
+#include <cstring>
 #include <limits>
+#include <memory>
 
 #include "engine/engine_memory.h"
 #include "platform/ui.h"
@@ -42,6 +44,29 @@ void BuildSampledTable(const float* s, float* table) {
         const float frac = p - static_cast<float>(k);
         table[j] = k < 1022 ? s[k] + (s[k + 1] - s[k]) * frac : s[k] + (s[k] - s[k - 1]) * frac;
     }
+}
+
+// The basis samples of each matrix never change: they are evaluated once per process and copied
+// into each build's curveArray. Immutable after the thread-safe initialisation of the statics.
+const float* BasisPrototype(const float* matrix) {
+    static const std::unique_ptr<float[]> catmullRom = [] {
+        auto samples = std::make_unique<float[]>(kCurveArrayFloats);
+        BuildBasisSamples(kCatmullRomMatrix, samples.get());
+        return samples;
+    }();
+    static const std::unique_ptr<float[]> hermite = [] {
+        auto samples = std::make_unique<float[]>(kCurveArrayFloats);
+        BuildBasisSamples(kHermiteMatrix, samples.get());
+        return samples;
+    }();
+    return matrix == kHermiteMatrix ? hermite.get() : catmullRom.get();
+}
+
+// Allocates this build's curveArray and fills it with the basis samples of matrix.
+std::unique_ptr<float[]> NewCurveArray(const float* matrix, const char* what) {
+    std::unique_ptr<float[]> curveArray = AllocateFloats(kCurveArrayFloats, what);
+    if (curveArray) std::memcpy(curveArray.get(), BasisPrototype(matrix), sizeof(float) * kCurveArrayFloats);
+    return curveArray;
 }
 
 bool PointsUsable(const CurvePoints& points) {
@@ -97,12 +122,11 @@ bool BuildCurveTable(const CurveRecord& curve, float* table) {
     // Only the spline needs the basis samples; fewer than three points make a straight ramp.
     std::unique_ptr<float[]> curveArray;
     if (n >= 3) {
-        curveArray = AllocateFloats(kCurveArrayFloats, "curveArray");
+        curveArray = NewCurveArray(kCatmullRomMatrix, "curveArray");
         if (!curveArray) {
             ShowMessage(kCurveArrayMessage, kMessageWarning);
             return false;
         }
-        BuildBasisSamples(kCatmullRomMatrix, curveArray.get());
     }
 
     const float x0 = pts.x[0];
@@ -163,12 +187,11 @@ bool BuildCurveTable(const CurveRecord& curve, float* table) {
 
 bool HCurve(float shadowsPoint, float shadowsSoftness, float highlightsPoint, float highlightsSoftness,
             float* shadows, float* midtones, float* highlights) {
-    std::unique_ptr<float[]> curveArray = AllocateFloats(kCurveArrayFloats, "HCurve");
+    std::unique_ptr<float[]> curveArray = NewCurveArray(kHermiteMatrix, "HCurve");
     if (!curveArray) {
         ShowMessage(kHCurveMessage, kMessageWarning);
         return false;
     }
-    BuildBasisSamples(kHermiteMatrix, curveArray.get());
     const float* ca = curveArray.get();
 
     // Non-finite numbers would make every weight NaN; they count as the reset values instead.

@@ -134,38 +134,34 @@ inline void EnableEverything(CorrectionSettings* s) {
     s->limitMethod = 3;
 }
 
-// A grade the size of a typical filter chain: levels, tone curves, Master contrast, brightness,
-// gamma, saturation and hue, vibrance, RGB range gains and the limiter.
+// A grade the size of a typical filter chain: levels, four tone curves, Master contrast, brightness,
+// gamma, saturation and hue, vibrance, colour balance through the RGB range gains, and the limiter.
 inline void EnableTypicalGrade(CorrectionSettings* s) {
     s->levelsEnable = 1;
-    for (int g = 0; g < 4; ++g) {
-        LevelsGroup& l = s->levels[g].group;
-        l.enable = 1;
-        l.inputBlack = 0.02f;
-        l.inputWhite = 0.98f;
-        l.outputBlack = 0.01f;
-        l.outputWhite = 0.99f;
-    }
+    s->levels[0].group = {1, 0.06f, 0.5f, 0.94f, 0.02f, 0.5f, 0.98f};
     s->curvesEnable = 1;
     s->toneCurvesEnable = 1;
     SetPoints(&s->toneCurves[0], {{0.0f, 0.0f}, {0.25f, 0.2f}, {0.75f, 0.8f}, {1.0f, 1.0f}});
-    SetPoints(&s->toneCurves[1], {{0.0f, 0.0f}, {0.5f, 0.52f}, {1.0f, 1.0f}});
+    SetPoints(&s->toneCurves[1], {{0.0f, 0.0f}, {0.5f, 0.55f}, {1.0f, 1.0f}});
+    SetPoints(&s->toneCurves[2], {{0.0f, 0.0f}, {0.5f, 0.5f}, {1.0f, 1.0f}});
+    SetPoints(&s->toneCurves[3], {{0.0f, 0.0f}, {0.5f, 0.45f}, {1.0f, 1.0f}});
     s->masterEnable = 1;
     s->tonalEnable = 1;
     TonalRange& m = s->tonal[kRangeMaster];
     m.enable = 1;
-    m.contrast = 15.0f;
-    m.brightness = 3.0f;
+    m.contrast = 10.0f;
+    m.brightness = 4.0f;
     m.gamma = 1.1f;
-    m.saturation = 115.0f;
-    m.hue = 4.0f;
-    m.vibrance = 20.0f;
+    m.saturation = 120.0f * 1.1f;
+    m.hue = 10.0f;
+    m.vibrance = 30.0f;
     s->rgbSet.enable = 1;
-    for (int r = kRangeHighlights; r <= kRangeShadows; ++r) {
-        s->rgbSet.range[r].enable = 1;
-        s->rgbSet.range[r].channel[kChannelRed].gain = 1.02f;
-        s->rgbSet.range[r].channel[kChannelBlue].gain = 0.97f;
-    }
+    s->rgbSet.range[kRangeShadows].enable = 1;
+    s->rgbSet.range[kRangeShadows].channel[kChannelRed].gain = 1.1f;
+    s->rgbSet.range[kRangeMidtones].enable = 1;
+    s->rgbSet.range[kRangeMidtones].channel[kChannelGreen].gain = 0.95f;
+    s->rgbSet.range[kRangeHighlights].enable = 1;
+    s->rgbSet.range[kRangeHighlights].channel[kChannelBlue].gain = 1.1f;
     s->enableLimiter = 1;
     s->limitMethod = 3;
 }
