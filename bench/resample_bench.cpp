@@ -1,5 +1,5 @@
 // The resampler on 1920x1080 sources, per image kind, shrinking by 0.25 and enlarging by 2, on the
-// path chosen at setup and on the portable one. items_per_second counts destination pixels.
+// path chosen at setup and on each path by name. items_per_second counts destination pixels.
 #include <benchmark/benchmark.h>
 
 #include <vector>
@@ -10,13 +10,13 @@
 namespace vt {
 namespace {
 
-// Args: kind, factor x 100, portable (1) or dispatched (0).
+// Args: kind, factor x 100, ResampleLevel (-1: the one chosen at setup).
 void BM_Resize(benchmark::State& state) {
     const auto kind = static_cast<ResampleKind>(state.range(0));
     const double factor = static_cast<double>(state.range(1)) / 100.0;
     const ResampleLevel saved = CurrentResampleLevel();
     InitResampleDispatch();
-    if (state.range(2) != 0) SetResampleLevel(ResampleLevel::kPortable);
+    if (state.range(2) >= 0) SetResampleLevel(static_cast<ResampleLevel>(state.range(2)));
     const uint32_t sw = 1920, sh = 1080;
     const auto dw = static_cast<uint32_t>(sw * factor), dh = static_cast<uint32_t>(sh * factor);
     const uint32_t bpp = kind == ResampleKind::kFloat4 ? 16 : 4;
@@ -44,11 +44,10 @@ void BM_Resize(benchmark::State& state) {
 void Cases(benchmark::internal::Benchmark* b) {
     for (int64_t kind : {0, 1, 2}) {
         for (int64_t factor : {25, 200}) {
-            b->Args({kind, factor, 0});
-            b->Args({kind, factor, 1});
+            for (int64_t level : {-1, 0, 1, 2}) b->Args({kind, factor, level});
         }
     }
-    b->ArgNames({"kind", "factor100", "portable"});
+    b->ArgNames({"kind", "factor100", "level"});
     b->Unit(benchmark::kMillisecond);
 }
 

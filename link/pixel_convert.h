@@ -30,8 +30,8 @@ void FBCopyAlpha(const void* inputPixels, ptrdiff_t inputRowBytes, void* outputP
 // pairs take eight bytes); 0 for codes the conversions do not know.
 uint32_t HostBytesPerPixel(uint32_t hostCode);
 
-// Picks the widest conversion path the processor supports. Called once from global setup; until
-// then the four-wide path every x86-64 processor has is used.
+// Picks the fastest conversion path the processor supports (AVX2 where present). Called once from
+// global setup; until then the four-wide path every x86-64 processor has is used.
 void InitLinkDispatch();
 
 }  // namespace vt
