@@ -29,8 +29,9 @@ public:
     // Writes everything set so far, replacing what an earlier Apply wrote.
     void Apply();
 
-    // POSIX only: the raw text of the registry file, for malformed-file tests; Apply writes it as is.
-    void SetRawFileText(const std::string& text);
+    // The raw text of the registry file, for malformed-file tests; Apply writes it as is. Returns
+    // false where the registry is not a file (Windows): the test has nothing to exercise there.
+    bool SetRawFileText(const std::string& text);
 
 private:
     struct Value {

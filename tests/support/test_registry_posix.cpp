@@ -66,9 +66,10 @@ void TestRegistry::SetRaw(const std::string& key, const std::string& name, uint3
 
 void TestRegistry::AddKey(const std::string& key, bool machine) { m_values.push_back({machine, key, "", 0, {}, true}); }
 
-void TestRegistry::SetRawFileText(const std::string& text) {
+bool TestRegistry::SetRawFileText(const std::string& text) {
     m_rawText = text;
     m_haveRawText = true;
+    return true;
 }
 
 void TestRegistry::Apply() {

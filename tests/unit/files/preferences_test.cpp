@@ -201,14 +201,16 @@ TEST(Preferences, ValuesLargerThanTheirFieldReadAsMissing) {
 
 TEST(Preferences, MalformedRegistryFileKeepsEveryReadableValue) {
     test::TestRegistry registry;
-    registry.SetRawFileText(std::string("Windows Registry Editor Version 5.00\n\n[HKEY_CURRENT_USER\\") +
-                            kPreferencesKey +
-                            "]\n"
-                            "\"Undo Depth\"=dword:0000000a\n"
-                            "\"UI Saturation\"=dword:nonsense\n"
-                            "\"Video System\"=\"PAL\n"
-                            "this is not a registry line\n"
-                            "\"Limiter Default\"=dword:00000001\n");
+    if (!registry.SetRawFileText(std::string("Windows Registry Editor Version 5.00\n\n[HKEY_CURRENT_USER\\") +
+                                 kPreferencesKey +
+                                 "]\n"
+                                 "\"Undo Depth\"=dword:0000000a\n"
+                                 "\"UI Saturation\"=dword:nonsense\n"
+                                 "\"Video System\"=\"PAL\n"
+                                 "this is not a registry line\n"
+                                 "\"Limiter Default\"=dword:00000001\n")) {
+        GTEST_SKIP() << "the registry is a file only in the POSIX build";
+    }
     registry.Apply();
     const Preferences p = Read();
     EXPECT_EQ(p.undoDepth, 10);
