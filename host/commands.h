@@ -29,6 +29,7 @@ PF_Err UserChangedParam(const CommandContext& context);
 PF_Err ImportSettings(const CommandContext& context);
 PF_Err SmartPreRender(const CommandContext& context);
 PF_Err SmartRender(const CommandContext& context);
+PF_Err HandleArbitraryCallback(const CommandContext& context);
 
 inline constexpr CommandHandler kParamsSetupHandler = ParamsSetup;
 inline constexpr CommandHandler kSequenceSetupHandler = SequenceSetup;
@@ -39,7 +40,7 @@ inline constexpr CommandHandler kRenderHandler = Render;
 inline constexpr CommandHandler kUserChangedParamHandler = UserChangedParam;
 inline constexpr CommandHandler kEventHandler = nullptr;
 inline constexpr CommandHandler kSettingsImportHandler = ImportSettings;
-inline constexpr CommandHandler kArbitraryCallbackHandler = nullptr;
+inline constexpr CommandHandler kArbitraryCallbackHandler = HandleArbitraryCallback;
 inline constexpr CommandHandler kSmartPreRenderHandler = SmartPreRender;
 inline constexpr CommandHandler kSmartRenderHandler = SmartRender;
 

@@ -6,6 +6,7 @@
 
 #include "engine/correction_settings.h"
 #include "engine/kernel.h"
+#include "engine/lookup_build.h"
 #include "host/global_state.h"
 #include "host/locked_handle.h"
 #include "host/memory.h"
@@ -47,15 +48,19 @@ CorrectionSettings* SettingsOf(const LockedHandle& value) { return value.as<Corr
 
 }  // namespace
 
-PF_Err RenderFrame(const RenderArea& area, uint32_t formatCode, uint32_t bytesPerPixel, GlobalState* global,
-                   const PF_InData* in_data) {
+PF_Err RenderFrame(const RenderArea& area, uint32_t formatCode, uint32_t bytesPerPixel, const EngineSet* tables,
+                   GlobalState* global, const PF_InData* in_data) {
     if (area.width <= 0 || area.height <= 0) return PF_Err_NONE;
     HostAllocator host{global, in_data};
     const bool hostMemory = global->hostId == kHostAfterEffects || global->hostId == kHostPremiere;
     FrameBuffer frame{};
-    if (FBNewFrameBuffer(static_cast<uint32_t>(area.width), static_cast<uint32_t>(area.height), &frame,
-                         kFormatPlanarFloat, hostMemory ? AllocateFromHost : nullptr, kFrameBufferName,
-                         &host) != 0) {
+    const uint32_t width = static_cast<uint32_t>(area.width);
+    const uint32_t height = static_cast<uint32_t>(area.height);
+    // The import writes every row of every plane, padding included: a heap store need not be cleared first.
+    const int32_t made = hostMemory ? FBNewFrameBuffer(width, height, &frame, kFormatPlanarFloat, AllocateFromHost,
+                                                       kFrameBufferName, &host)
+                                    : FBNewUnclearedFrameBuffer(width, height, &frame, kFormatPlanarFloat);
+    if (made != 0) {
         ShowMessage(kFrameBufferFailed, kMessageWarning);
         return PF_Err_NONE;
     }
@@ -66,7 +71,11 @@ PF_Err RenderFrame(const RenderArea& area, uint32_t formatCode, uint32_t bytesPe
     uint8_t* output = area.outputPixels + area.outputRowBytes * area.outputY +
                       static_cast<ptrdiff_t>(area.outputX) * bytesPerPixel;
     FBImportPixels(input, area.inputRowBytes, formatCode, &frame);
-    Correct(frame, frame);
+    if (tables) {
+        RunKernel(ActiveKernelPath(), &tables->params, frame, frame);
+    } else {
+        Correct(frame, frame);
+    }
     FBExportPixels(&frame, output, area.outputRowBytes, formatCode);
     FBCopyAlpha(input, area.inputRowBytes, output, area.outputRowBytes, static_cast<uint32_t>(area.width),
                 static_cast<uint32_t>(area.height), formatCode);
@@ -118,13 +127,14 @@ PF_Err SmartRender(const CommandContext& context) {
                            parameters.param_type == PF_Param_ARBITRARY_DATA ? parameters.u.arb_d.value : nullptr);
         CorrectionSettings* settings = SettingsOf(value);
         if (result == PF_Err_NONE) {
-            if (in_data->sequence_data && settings) ApplySettings(in_data->sequence_data, settings, global, in_data);
+            std::shared_ptr<const EngineSet> tables;
+            if (in_data->sequence_data && settings) tables = ApplySettings(in_data->sequence_data, settings, global, in_data);
             // The input may be smaller than the output the host asks for: only pixels both hold are read.
             RenderArea area{reinterpret_cast<const uint8_t*>(input->data), input->rowbytes,
                             reinterpret_cast<uint8_t*>(output->data), output->rowbytes,
                             std::min(output->width, input->width), std::min(output->height, input->height),
                             0, 0, 0, 0};
-            result = RenderFrame(area, code, bytesPerPixel, global, in_data);
+            result = RenderFrame(area, code, bytesPerPixel, tables.get(), global, in_data);
         }
     }
     const PF_Err checkin = in_data->inter.checkin_param(in_data->effect_ref, &parameters);
@@ -176,12 +186,13 @@ PF_Err Render(const CommandContext& context) {
         SwapSettingsIfForeign(settings);
         ParamsToSettings(settings, params, global);
     }
+    std::shared_ptr<const EngineSet> tables;
     if (!in_data->sequence_data) {
         ShowMessage(kNoSequenceData, kMessageWarning);
     } else if (settings) {
-        ApplySettings(in_data->sequence_data, settings, global, in_data);
+        tables = ApplySettings(in_data->sequence_data, settings, global, in_data);
     }
-    return RenderFrame(area, code, bytesPerPixel, global, in_data);
+    return RenderFrame(area, code, bytesPerPixel, tables.get(), global, in_data);
 }
 
 }  // namespace vt

@@ -10,6 +10,7 @@
 namespace vt {
 
 struct CorrectionSettings;
+struct EngineSet;
 struct GlobalState;
 
 PF_Err SmartPreRender(const CommandContext& context);
@@ -29,8 +30,9 @@ struct RenderArea {
     int32_t outputY;
 };
 
-// Corrects one frame region; always 0 (failures are told to the user and leave the output as it was).
-PF_Err RenderFrame(const RenderArea& area, uint32_t formatCode, uint32_t bytesPerPixel, GlobalState* global,
-                   const PF_InData* in_data);
+// Corrects one frame region with the given tables (the published ones when null); always 0
+// (failures are told to the user and leave the output as it was).
+PF_Err RenderFrame(const RenderArea& area, uint32_t formatCode, uint32_t bytesPerPixel, const EngineSet* tables,
+                   GlobalState* global, const PF_InData* in_data);
 
 }  // namespace vt

@@ -3,6 +3,7 @@
 #include <array>
 #include <cstdio>
 #include <cstring>
+#include <mutex>
 
 #include "engine/correction_settings.h"
 #include "engine/lookup_build.h"
@@ -78,6 +79,12 @@ constexpr SectionEnables kSectionEnables[] = {
 };
 
 constexpr uint32_t kLastApplyTag = 1;
+
+// The classic render (under renderLock) and every other command (under entryLock) may apply
+// settings at the same time: the decision to rebuild, the rebuild and the record of which instance
+// the published tables belong to are made as one step under this lock.
+std::mutex g_applyMutex;
+std::shared_ptr<const EngineSet> g_appliedSet;  // the set built from lastSequence's settings; guarded by g_applyMutex
 
 uint32_t& Word(CorrectionSettings* settings, uint32_t offset) {
     return *reinterpret_cast<uint32_t*>(reinterpret_cast<uint8_t*>(settings) + offset);
@@ -333,7 +340,9 @@ PF_Err UserChangedParam(const CommandContext& context) {
     return PF_Err_NONE;
 }
 
-void ApplySettings(PF_Handle sequence, CorrectionSettings* settings, GlobalState* global, const PF_InData* in_data) {
+std::shared_ptr<const EngineSet> ApplySettings(PF_Handle sequence, CorrectionSettings* settings, GlobalState* global,
+                                               const PF_InData* in_data) {
+    std::lock_guard<std::mutex> guard(g_applyMutex);
     const Preferences& prefs = EnsurePreferencesLoaded();
     // The host's four characters as they lie in memory ("CTXF" for After Effects on this byte order).
     char signature[8];
@@ -358,18 +367,21 @@ void ApplySettings(PF_Handle sequence, CorrectionSettings* settings, GlobalState
         LockedHandle copy(in_data, sequenceState->appliedCopy);
         if (copy.size() >= kParametersSize) {
             if (global->lastSequence == sequence && global->lastApplyTag != 0 &&
-                std::memcmp(copy.get(), settings, kParametersSize) == 0) {
-                return;
+                std::memcmp(copy.get(), settings, kParametersSize) == 0 && g_appliedSet) {
+                return g_appliedSet;
             }
             std::memcpy(copy.get(), settings, kParametersSize);
             global->lastSequence = sequence;
             global->lastApplyTag = kLastApplyTag;
             Update(*settings);
-            return;
+            g_appliedSet = CurrentEngineSet();
+            return g_appliedSet;
         }
     }
     global->lastSequence = sequence;
     Update(*settings);
+    g_appliedSet = CurrentEngineSet();
+    return g_appliedSet;
 }
 
 }  // namespace vt

@@ -4,6 +4,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <memory>
 #include <type_traits>
 
 #include "host/commands.h"
@@ -12,6 +13,7 @@
 namespace vt {
 
 struct CorrectionSettings;
+struct EngineSet;
 struct GlobalState;
 
 struct SequenceState {
@@ -63,7 +65,10 @@ void MarkSettingsChanged(const GlobalState* global, PF_ParamDef** params);
 
 PF_Err UserChangedParam(const CommandContext& context);
 
-// Rebuilds the lookup tables from settings unless this instance's last build used the same bytes.
-void ApplySettings(PF_Handle sequence, CorrectionSettings* settings, GlobalState* global, const PF_InData* in_data);
+// Rebuilds the lookup tables from settings unless this instance's last build used the same bytes,
+// and returns the table set that corresponds to them, for the render to correct with. Renders on
+// other threads may publish newer sets meanwhile; the returned one stays valid while it is held.
+std::shared_ptr<const EngineSet> ApplySettings(PF_Handle sequence, CorrectionSettings* settings, GlobalState* global,
+                                               const PF_InData* in_data);
 
 }  // namespace vt

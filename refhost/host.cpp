@@ -189,6 +189,10 @@ PF_Err ClearSupportedPixelFormats(PF_ProgPtr) {
 PF_Err PixelFormatGetPixelFormat(PF_EffectWorld* world, PrPixelFormat* format) {
     if (!world || !format) return PF_Err_BAD_CALLBACK_PARAM;
     WorldLayout layout;
+    if (Current().pixelFormatOverride() != 0) {
+        *format = Current().pixelFormatOverride();
+        return PF_Err_NONE;
+    }
     // A world the host did not make reads as its most common layout.
     *format = Current().WorldLayoutOf(world, &layout) ? PixelFormatSuiteAnswer(layout) : PrPixelFormat_BGRA_4444_8u;
     return *format ? PF_Err_NONE : PF_Err_BAD_CALLBACK_PARAM;

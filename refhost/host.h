@@ -89,6 +89,9 @@ public:
 
     // Test controls.
     void SetSuiteOffered(const std::string& name, int32_t version, bool offered);
+    // Makes the pixel-format suite name this format for every world (0: answer truthfully).
+    void SetPixelFormatOverride(int32_t format) { m_pixelFormatOverride = format; }
+    int32_t pixelFormatOverride() const { return m_pixelFormatOverride; }
 
     // PF_Cmd_PARAMS_SETUP: the effect declares its parameters; they are kept as the effect's
     // definitions, from which every instance takes its own values.
@@ -170,6 +173,7 @@ private:
     int m_pixelFormatClears = 0;
     std::string m_registeredName;
     int32_t m_pluginId = 0;
+    int32_t m_pixelFormatOverride = 0;
 };
 
 // Decodes a property list's bytes; false with *error set when they are malformed.

@@ -36,6 +36,8 @@ public:
     World(WorldLayout layout, int32_t width, int32_t height);
     World(const World&) = delete;
     World& operator=(const World&) = delete;
+    // Moving keeps the pixel store (and so the world's data pointer) where it is.
+    World(World&&) = default;
 
     PF_EffectWorld* get() { return &m_world; }
     const PF_EffectWorld* get() const { return &m_world; }
