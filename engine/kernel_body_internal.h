@@ -140,55 +140,78 @@ inline Pixel MixWithLuma(const Pixel& px, F f, F lumaPart) {
     return {px.r * f + lumaPart, px.g * f + lumaPart, px.b * f + lumaPart};
 }
 
-inline void ApplyTonalRanges(const EngineParams& p, const Weights& w, Pixel& px) {
+// Each sub-step runs over the whole block before the next begins (see CorrectBlock).
+inline void ApplyTonalRanges(const EngineParams& p, const Weights* w, Pixel* px, int n) {
     const StageFlags& f = p.flags;
     if (f.tonalHueRotation) {
-        const Yuv yuv = ToYuv(px);
-        const F cs = WeightedSum(w, p.tonalCos);
-        const F sn = WeightedSum(w, p.tonalSin);
-        px = FromYuv(yuv.y * w.sum, yuv.u * cs - yuv.v * sn, yuv.u * sn + yuv.v * cs);
+        for (int g = 0; g < n; ++g) {
+            const Yuv yuv = ToYuv(px[g]);
+            const F cs = WeightedSum(w[g], p.tonalCos);
+            const F sn = WeightedSum(w[g], p.tonalSin);
+            px[g] = FromYuv(yuv.y * w[g].sum, yuv.u * cs - yuv.v * sn, yuv.u * sn + yuv.v * cs);
+        }
     }
-    if (f.tonalGain) px = Scale(px, WeightedSum(w, p.tonalGain));
+    if (f.tonalGain) {
+        for (int g = 0; g < n; ++g) px[g] = Scale(px[g], WeightedSum(w[g], p.tonalGain));
+    }
     if (f.tonalPedestal) {
-        const F pedestal = WeightedSum(w, p.tonalPedestal);
-        px = {px.r + pedestal, px.g + pedestal, px.b + pedestal};
+        for (int g = 0; g < n; ++g) {
+            const F pedestal = WeightedSum(w[g], p.tonalPedestal);
+            px[g] = {px[g].r + pedestal, px[g].g + pedestal, px[g].b + pedestal};
+        }
     }
     if (f.tonalCurve) {
-        px = {WeightedLookup(p.tonal, w, px.r), WeightedLookup(p.tonal, w, px.g), WeightedLookup(p.tonal, w, px.b)};
+        for (int g = 0; g < n; ++g) {
+            px[g] = {WeightedLookup(p.tonal, w[g], px[g].r), WeightedLookup(p.tonal, w[g], px[g].g),
+                     WeightedLookup(p.tonal, w[g], px[g].b)};
+        }
     }
     if (f.tonalSaturation) {
-        const F s = WeightedSum(w, p.tonalSaturation);
-        px = MixWithLuma(px, s, Luma(px) * (w.sum - s));
+        for (int g = 0; g < n; ++g) {
+            const F s = WeightedSum(w[g], p.tonalSaturation);
+            px[g] = MixWithLuma(px[g], s, Luma(px[g]) * (w[g].sum - s));
+        }
     }
     if (f.tonalVibrance) {
-        const F cap = VibranceCap(px);
-        const F factor = w.w[1] * Min(Splat(p.tonalVibrance[1]), cap) + w.w[2] * Min(Splat(p.tonalVibrance[2]), cap) +
-                         w.w[3] * Min(Splat(p.tonalVibrance[3]), cap);
-        px = MixWithLuma(px, factor, Luma(px) * (w.sum - factor));
+        for (int g = 0; g < n; ++g) {
+            const F cap = VibranceCap(px[g]);
+            const F factor = w[g].w[1] * Min(Splat(p.tonalVibrance[1]), cap) +
+                             w[g].w[2] * Min(Splat(p.tonalVibrance[2]), cap) +
+                             w[g].w[3] * Min(Splat(p.tonalVibrance[3]), cap);
+            px[g] = MixWithLuma(px[g], factor, Luma(px[g]) * (w[g].sum - factor));
+        }
     }
 }
 
-inline void ApplyTonalMaster(const EngineParams& p, Pixel& px) {
+inline void ApplyTonalMaster(const EngineParams& p, Pixel* px, int n) {
     const StageFlags& f = p.flags;
     if (f.masterHueRotation) {
-        const Yuv yuv = ToYuv(px);
         const F cs = Splat(p.tonalCos[0]);
         const F sn = Splat(p.tonalSin[0]);
-        px = FromYuv(yuv.y, yuv.u * cs - yuv.v * sn, yuv.u * sn + yuv.v * cs);
+        for (int g = 0; g < n; ++g) {
+            const Yuv yuv = ToYuv(px[g]);
+            px[g] = FromYuv(yuv.y, yuv.u * cs - yuv.v * sn, yuv.u * sn + yuv.v * cs);
+        }
     }
     const F gain = Splat(p.tonalGain[0]);
     const F pedestal = Splat(p.tonalPedestal[0]);
-    px = {px.r * gain + pedestal, px.g * gain + pedestal, px.b * gain + pedestal};
+    for (int g = 0; g < n; ++g) px[g] = {px[g].r * gain + pedestal, px[g].g * gain + pedestal, px[g].b * gain + pedestal};
     if (f.masterCurve) {
         const ExtrapolatedTable& t = p.tonal[0];
-        px = {LookupExtrapolated(t, px.r), LookupExtrapolated(t, px.g), LookupExtrapolated(t, px.b)};
+        for (int g = 0; g < n; ++g) {
+            px[g] = {LookupExtrapolated(t, px[g].r), LookupExtrapolated(t, px[g].g), LookupExtrapolated(t, px[g].b)};
+        }
     }
     if (f.masterSaturation) {
-        px = MixWithLuma(px, Splat(p.tonalSaturation[0]), Luma(px) * Splat(p.tonalDesaturation[0]));
+        for (int g = 0; g < n; ++g) {
+            px[g] = MixWithLuma(px[g], Splat(p.tonalSaturation[0]), Luma(px[g]) * Splat(p.tonalDesaturation[0]));
+        }
     }
     if (f.masterVibrance) {
-        const F factor = Min(Splat(p.tonalVibrance[0]), VibranceCap(px));
-        px = MixWithLuma(px, factor, Luma(px) * (Splat(1.0f) - factor));
+        for (int g = 0; g < n; ++g) {
+            const F factor = Min(Splat(p.tonalVibrance[0]), VibranceCap(px[g]));
+            px[g] = MixWithLuma(px[g], factor, Luma(px[g]) * (Splat(1.0f) - factor));
+        }
     }
 }
 
@@ -224,16 +247,19 @@ inline F SetMasterChannel(const EngineParams& p, int set, int c, F v) {
     return p.flags.setMasterGamma[set] ? LookupExtrapolated(p.setGamma[set][0][c], v) : v;
 }
 
-inline void ApplyChannelSets(const EngineParams& p, const Weights& w, Pixel& px) {
+inline void ApplyChannelSets(const EngineParams& p, const Weights* w, Pixel* px, int n) {
     for (int set = 0; set < kChannelSetCount; ++set) {
-        if (p.flags.setRanges[set]) {
-            px = {SetRangesChannel(p, set, 0, w, px.r), SetRangesChannel(p, set, 1, w, px.g),
-                  SetRangesChannel(p, set, 2, w, px.b)};
+        if (!p.flags.setRanges[set]) continue;
+        for (int g = 0; g < n; ++g) {
+            px[g] = {SetRangesChannel(p, set, 0, w[g], px[g].r), SetRangesChannel(p, set, 1, w[g], px[g].g),
+                     SetRangesChannel(p, set, 2, w[g], px[g].b)};
         }
     }
     for (int set = 0; set < kChannelSetCount; ++set) {
-        if (p.flags.setMaster[set]) {
-            px = {SetMasterChannel(p, set, 0, px.r), SetMasterChannel(p, set, 1, px.g), SetMasterChannel(p, set, 2, px.b)};
+        if (!p.flags.setMaster[set]) continue;
+        for (int g = 0; g < n; ++g) {
+            px[g] = {SetMasterChannel(p, set, 0, px[g].r), SetMasterChannel(p, set, 1, px[g].g),
+                     SetMasterChannel(p, set, 2, px[g].b)};
         }
     }
 }
@@ -340,9 +366,10 @@ inline void ApplySecondary(const EngineParams& p, int k, Pixel& px) {
     px = FromYuv(from.y + (to.y - from.y) * key, from.u + (to.u - from.u) * key, from.v + (to.v - from.v) * key);
 }
 
-inline void ApplySecondaries(const EngineParams& p, Pixel& px) {
+inline void ApplySecondaries(const EngineParams& p, Pixel* px, int n) {
     for (int k = 0; k < 6; ++k) {
-        if (p.flags.secondary[k]) ApplySecondary(p, k, px);
+        if (!p.flags.secondary[k]) continue;
+        for (int g = 0; g < n; ++g) ApplySecondary(p, k, px[g]);
     }
 }
 
@@ -353,53 +380,57 @@ inline void ClipAt(Pixel& px, F y, M reached, F numerator) {
     px = SelectPixel(m, Scale(px, numerator / Select(m, y, Splat(1.0f))), px);
 }
 
-inline void ApplyLimiter(const EngineParams& p, Pixel& px) {
-    F y = Luma(px);
-    if (p.flags.softClip) {
-        const F knee = Splat(p.softKnee);
-        ClipAt(px, y, y >= knee, (y - knee) * Splat(p.softRatio) + knee);
-        y = Luma(px);
-    }
-    const F hard = Splat(p.hardClip);
-    ClipAt(px, y, y >= hard, hard);
-
+inline void ApplyCompositeLimit(const EngineParams& p, int side, Pixel& px) {
     const F zero = Splat(0.0f);
     const F one = Splat(1.0f);
     const F hundred = Splat(100.0f);
-    const F hundredth = Splat(0.01f);
-    const bool preview = p.flags.limiterPreview != 0;
     const uint32_t method = p.limitMethod;
-    for (int side = 0; side < 2; ++side) {
-        const Yuv yuv = ToYuv(px);
-        const F u = yuv.u * hundred;
-        const F v = yuv.v * hundred;
-        const F q = Sqrt(Max(u * u + v * v, one));
-        const F limit = Splat(side == 0 ? p.compositeMax : p.compositeMin);
-        // top = 100 Y + Q must stay below the upper limit, bottom = 100 Y - Q above the lower one.
-        const F level = side == 0 ? hundred * yuv.y + q : hundred * yuv.y - q;
-        const M outside = side == 0 ? level >= limit : level <= limit;
-        if (!Any(outside)) continue;
-        if (preview) {
-            px = SelectPixel(outside, Pixel{zero, zero, zero}, px);
-        } else if (method == 2) {
-            const M m = outside & (level != zero);
-            px = SelectPixel(m, Scale(px, limit / Select(m, level, one)), px);
-        } else if (method == 1 || method == 3) {
-            // The lower factor is bounded at 0 like the upper one, so the chroma of very dark pixels
-            // is removed rather than inverted.
-            const F excess = side == 0 ? level - limit : limit - level;
-            const F share = (side == 0 && method == 3) ? Splat(0.4f) * excess : excess;
-            const F f = Max((q - share) / q, zero) * hundredth;
-            Pixel reduced = FromYuv(yuv.y, f * u, f * v);
-            if (side == 0 && method == 3) {
-                // Smart Limit also scales by the limit over the level; a zero level keeps the
-                // reduced chroma unscaled.
-                const M nonZero = level != zero;
-                reduced = SelectPixel(nonZero, Scale(reduced, limit / Select(nonZero, level, one)), reduced);
-            }
-            px = SelectPixel(outside, reduced, px);
+    const Yuv yuv = ToYuv(px);
+    const F u = yuv.u * hundred;
+    const F v = yuv.v * hundred;
+    const F q = Sqrt(Max(u * u + v * v, one));
+    const F limit = Splat(side == 0 ? p.compositeMax : p.compositeMin);
+    // top = 100 Y + Q must stay below the upper limit, bottom = 100 Y - Q above the lower one.
+    const F level = side == 0 ? hundred * yuv.y + q : hundred * yuv.y - q;
+    const M outside = side == 0 ? level >= limit : level <= limit;
+    if (!Any(outside)) return;
+    if (p.flags.limiterPreview) {
+        px = SelectPixel(outside, Pixel{zero, zero, zero}, px);
+    } else if (method == 2) {
+        const M m = outside & (level != zero);
+        px = SelectPixel(m, Scale(px, limit / Select(m, level, one)), px);
+    } else if (method == 1 || method == 3) {
+        // The lower factor is bounded at 0 like the upper one, so the chroma of very dark pixels
+        // is removed rather than inverted.
+        const F excess = side == 0 ? level - limit : limit - level;
+        const F share = (side == 0 && method == 3) ? Splat(0.4f) * excess : excess;
+        const F f = Max((q - share) / q, zero) * Splat(0.01f);
+        Pixel reduced = FromYuv(yuv.y, f * u, f * v);
+        if (side == 0 && method == 3) {
+            // Smart Limit also scales by the limit over the level; a zero level keeps the
+            // reduced chroma unscaled.
+            const M nonZero = level != zero;
+            reduced = SelectPixel(nonZero, Scale(reduced, limit / Select(nonZero, level, one)), reduced);
+        }
+        px = SelectPixel(outside, reduced, px);
+    }
+}
+
+inline void ApplyLimiter(const EngineParams& p, Pixel* px, int n) {
+    if (p.flags.softClip) {
+        const F knee = Splat(p.softKnee);
+        for (int g = 0; g < n; ++g) {
+            const F y = Luma(px[g]);
+            ClipAt(px[g], y, y >= knee, (y - knee) * Splat(p.softRatio) + knee);
         }
     }
+    const F hard = Splat(p.hardClip);
+    for (int g = 0; g < n; ++g) {
+        const F y = Luma(px[g]);
+        ClipAt(px[g], y, y >= hard, hard);
+    }
+    for (int g = 0; g < n; ++g) ApplyCompositeLimit(p, 0, px[g]);
+    for (int g = 0; g < n; ++g) ApplyCompositeLimit(p, 1, px[g]);
 }
 
 inline void StorePixel(const KernelPlanes& planes, size_t i, const Pixel& px) {
@@ -409,22 +440,50 @@ inline void StorePixel(const KernelPlanes& planes, size_t i, const Pixel& px) {
     Store(planes.destination[3] + i, Luma(px));
 }
 
-inline Pixel CorrectPixel(const EngineParams& p, Pixel px) {
+// Groups corrected together, stage by stage. One group's path through all stages is a single long
+// dependency chain (table reads, divisions); running each stage over several independent groups
+// lets the processor overlap them, and keeps each stage's coefficients at hand.
+constexpr int kBlockGroups = 8;
+
+inline void CorrectBlock(const EngineParams& p, Pixel* px, int n) {
     const StageFlags& f = p.flags;
-    Weights w{};
-    if (f.rangeWeights) w = RangeWeights(p, px);
-    if (f.autoCompress) ApplyAutoCompression(p, px);
-    if (f.levels) ApplyLevelsInput(p, px);
-    if (f.tonalRanges) ApplyTonalRanges(p, w, px);
-    if (f.tonalMaster) ApplyTonalMaster(p, px);
-    if (f.hueWheels) ApplyHueWheels(p, w, px);
-    ApplyChannelSets(p, w, px);
-    if (f.toneCurves) ApplyToneCurves(p, px);
-    if (f.hueCurves) ApplyHueCurves(p, px);
-    if (f.levels) ApplyLevelsOutput(p, px);
-    if (f.secondaries) ApplySecondaries(p, px);
-    if (f.limiter) ApplyLimiter(p, px);
-    return px;
+    Weights w[kBlockGroups];
+    if (f.rangeWeights) {
+        for (int k = 0; k < n; ++k) w[k] = RangeWeights(p, px[k]);
+    }
+    if (f.autoCompress) {
+        for (int k = 0; k < n; ++k) ApplyAutoCompression(p, px[k]);
+    }
+    if (f.levels) {
+        for (int k = 0; k < n; ++k) ApplyLevelsInput(p, px[k]);
+    }
+    if (f.tonalRanges) {
+        ApplyTonalRanges(p, w, px, n);
+    }
+    if (f.tonalMaster) {
+        ApplyTonalMaster(p, px, n);
+    }
+    if (f.hueWheels) {
+        for (int k = 0; k < n; ++k) ApplyHueWheels(p, w[k], px[k]);
+    }
+    if (f.setRanges[kSetRgb] || f.setRanges[kSetSecond] || f.setMaster[kSetRgb] || f.setMaster[kSetSecond]) {
+        ApplyChannelSets(p, w, px, n);
+    }
+    if (f.toneCurves) {
+        for (int k = 0; k < n; ++k) ApplyToneCurves(p, px[k]);
+    }
+    if (f.hueCurves) {
+        for (int k = 0; k < n; ++k) ApplyHueCurves(p, px[k]);
+    }
+    if (f.levels) {
+        for (int k = 0; k < n; ++k) ApplyLevelsOutput(p, px[k]);
+    }
+    if (f.secondaries) {
+        ApplySecondaries(p, px, n);
+    }
+    if (f.limiter) {
+        ApplyLimiter(p, px, n);
+    }
 }
 
 }  // namespace
@@ -433,21 +492,38 @@ void CorrectPlanes(const EngineParams& params, const KernelPlanes& planes) {
     // A local copy of the block: nothing the loop stores can alias it, so its values may stay in
     // registers across groups.
     const EngineParams p = params;
-    const size_t full = planes.count - planes.count % kLanes;
-    for (size_t i = 0; i < full; i += kLanes) StorePixel(planes, i, CorrectPixel(p, LoadPixel(planes, i)));
-
-    // The last few floats of a plane whose length is not a whole group: through a padded group.
-    const size_t rest = planes.count - full;
-    if (rest == 0) return;
-    float in[3][kLanes] = {};
-    float out[4][kLanes] = {};
-    for (int c = 0; c < 3; ++c) {
-        for (size_t l = 0; l < rest; ++l) in[c][l] = planes.source[c][full + l];
+    constexpr size_t kBlock = static_cast<size_t>(kLanes) * kBlockGroups;
+    Pixel px[kBlockGroups];
+    const size_t fullBlocks = planes.count - planes.count % kBlock;
+    for (size_t i = 0; i < fullBlocks; i += kBlock) {
+        for (int k = 0; k < kBlockGroups; ++k) px[k] = LoadPixel(planes, i + static_cast<size_t>(k) * kLanes);
+        CorrectBlock(p, px, kBlockGroups);
+        for (int k = 0; k < kBlockGroups; ++k) StorePixel(planes, i + static_cast<size_t>(k) * kLanes, px[k]);
     }
-    const KernelPlanes tail{{in[0], in[1], in[2]}, {out[0], out[1], out[2], out[3]}, kLanes};
-    StorePixel(tail, 0, CorrectPixel(p, LoadPixel(tail, 0)));
-    for (int c = 0; c < 4; ++c) {
-        for (size_t l = 0; l < rest; ++l) planes.destination[c][full + l] = out[c][l];
+
+    // The rest: whole groups, then the last few floats of a plane whose length is not a whole group
+    // through a padded group.
+    const size_t full = planes.count - planes.count % kLanes;
+    const int groups = static_cast<int>((full - fullBlocks) / kLanes);
+    float in[3][kLanes] = {};
+    for (int c = 0; c < 3; ++c) {
+        for (size_t l = 0; full + l < planes.count; ++l) in[c][l] = planes.source[c][full + l];
+    }
+    const KernelPlanes tail{{in[0], in[1], in[2]}, {nullptr, nullptr, nullptr, nullptr}, kLanes};
+    for (int k = 0; k < groups; ++k) px[k] = LoadPixel(planes, fullBlocks + static_cast<size_t>(k) * kLanes);
+    const bool partial = full < planes.count;
+    if (partial) px[groups] = LoadPixel(tail, 0);
+    const int n = groups + (partial ? 1 : 0);
+    if (n == 0) return;
+    CorrectBlock(p, px, n);
+    for (int k = 0; k < groups; ++k) StorePixel(planes, fullBlocks + static_cast<size_t>(k) * kLanes, px[k]);
+    if (partial) {
+        float out[4][kLanes];
+        const KernelPlanes padded{{nullptr, nullptr, nullptr}, {out[0], out[1], out[2], out[3]}, kLanes};
+        StorePixel(padded, 0, px[groups]);
+        for (int c = 0; c < 4; ++c) {
+            for (size_t l = 0; full + l < planes.count; ++l) planes.destination[c][full + l] = out[c][l];
+        }
     }
 }
 
