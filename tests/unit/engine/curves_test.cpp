@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "engine/engine_memory.h"
+#include "tests/support/platform_capture.h"
 
 namespace vt {
 namespace {
@@ -208,6 +209,7 @@ TEST(Curves, ExtremeLumaRangesDefineEveryWeight) {
 bool RefuseNamed(const char* what, void* context) { return std::strcmp(what, static_cast<const char*>(context)) == 0; }
 
 TEST(Curves, MissingWorkingMemoryLeavesTablesAsTheyWere) {
+    test::PlatformCapture capture;
     static char name[] = "curveArray";
     SetEngineAllocationHook(RefuseNamed, name);
     std::vector<float> t(kLookupSize, 0.125f);
@@ -223,6 +225,13 @@ TEST(Curves, MissingWorkingMemoryLeavesTablesAsTheyWere) {
     EXPECT_FALSE(HCurve(0.3f, 0.3831f, 0.7f, 0.3831f, w.sh.data(), w.mid.data(), w.hi.data()));
     EXPECT_TRUE(std::isnan(w.sh[5]) && std::isnan(w.mid[5]) && std::isnan(w.hi[5]));
     SetEngineAllocationHook(nullptr, nullptr);
+
+    const auto messages = capture.Messages();
+    ASSERT_EQ(2u, messages.size());
+    EXPECT_EQ("Insufficient memory for curveArray", messages[0].text);
+    EXPECT_EQ(1, messages[0].kind);
+    EXPECT_EQ("Insufficient memory for HCurve", messages[1].text);
+    EXPECT_EQ(1, messages[1].kind);
 }
 
 }  // namespace

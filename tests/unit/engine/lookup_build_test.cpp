@@ -10,6 +10,7 @@
 
 #include "engine/curves.h"
 #include "engine/engine_memory.h"
+#include "tests/support/platform_capture.h"
 #include "tests/unit/engine/engine_test_support.h"
 
 namespace vt {
@@ -358,6 +359,7 @@ TEST_F(Publication, UpdatePublishesAndCountsRebuilds) {
 }
 
 TEST_F(Publication, MissingScratchKeepsThePreviousSet) {
+    test::PlatformCapture capture;
     auto s = ResetRecord();
     Update(*s);
     auto before = CurrentEngineSet();
@@ -368,6 +370,12 @@ TEST_F(Publication, MissingScratchKeepsThePreviousSet) {
         Update(*s);
         EXPECT_EQ(1, refusal.count) << what;
         EXPECT_EQ(before, CurrentEngineSet()) << what;
+    }
+    const auto messages = capture.Messages();
+    ASSERT_EQ(3u, messages.size());
+    for (const auto& m : messages) {
+        EXPECT_EQ("Insufficient memory for calcArray during parameter update", m.text);
+        EXPECT_EQ(1, m.kind);
     }
 }
 
@@ -399,6 +407,7 @@ TEST_F(Publication, MissingCurveMemoryKeepsThoseTables) {
     EXPECT_NEAR(0.25f, after->params.toneCurve[1].table[8192], 1e-6f);
 
     // Without masterLookup every tone curve keeps its table; the rest of the rebuild goes on.
+    test::PlatformCapture capture;
     Refusal master{"masterLookup"};
     SetEngineAllocationHook(RefuseNamed, &master);
     s->hueCurvesEnable = 0;
@@ -407,6 +416,8 @@ TEST_F(Publication, MissingCurveMemoryKeepsThoseTables) {
     EXPECT_EQ(1, master.count);
     EXPECT_EQ(after->params.toneCurve[1].table[8192], last->params.toneCurve[1].table[8192]);
     EXPECT_FALSE(last->params.flags.hueCurves);
+    ASSERT_EQ(1u, capture.Messages().size());
+    EXPECT_EQ("Insufficient memory for masterLookup during parameter update", capture.Messages()[0].text);
 
     // The weights keep theirs when HCurve has no memory.
     Refusal weights{"HCurve"};
