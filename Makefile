@@ -44,6 +44,29 @@ windows: $(WIN_BUILD)/build.ninja
 test-windows: windows
 	bash scripts/wine-test.sh $(WIN_BUILD)
 
+# libFuzzer over every reader, the text form's scan and unflatten, with clang and the sanitizers:
+# FUZZ_SECONDS per target (seven targets), new inputs kept in $(FUZZ_BUILD)/corpus, findings as
+# $(FUZZ_BUILD)/crash-* (the run stops at the first).
+FUZZ_BUILD ?= build-fuzz
+FUZZ_SECONDS ?= 90
+FUZZ_TARGETS := point_curve arbitrary_map autodesk_lut quantel_lut settings_preset settings_scan settings_unflatten
+
+$(FUZZ_BUILD)/build.ninja:
+	CC=clang CXX=clang++ cmake -S . -B $(FUZZ_BUILD) -G Ninja -DCMAKE_BUILD_TYPE=RelWithDebInfo -DVT_FUZZ=ON -DVT_SANITIZE=ON \
+	  -DVT_BUILD_TOOLS=OFF -DVT_BUILD_BENCH=OFF -DCMAKE_C_FLAGS=-fsanitize=fuzzer-no-link \
+	  -DCMAKE_CXX_FLAGS=-fsanitize=fuzzer-no-link $(CMAKE_FLAGS)
+
+fuzz: deps $(FUZZ_BUILD)/build.ninja
+	cmake --build $(FUZZ_BUILD) -j $(JOBS) --target vt_fuzzers
+	@set -e; for t in $(FUZZ_TARGETS); do \
+	  mkdir -p $(FUZZ_BUILD)/corpus/$$t; \
+	  echo "== $$t: $(FUZZ_SECONDS) s"; \
+	  VT_TEST_DATA=$(CURDIR)/tests/data $(FUZZ_BUILD)/tests/fuzz/$${t}_fuzz -max_total_time=$(FUZZ_SECONDS) \
+	    -malloc_limit_mb=512 -rss_limit_mb=2048 -timeout=20 -print_final_stats=1 \
+	    -artifact_prefix=$(FUZZ_BUILD)/$${t}- $(FUZZ_BUILD)/corpus/$$t tests/fuzz/corpus/$$t \
+	    $$(test -d tests/data/$$t && echo tests/data/$$t); \
+	done
+
 bench: build
 	@for b in $(BUILD)/bench/*_bench; do echo "== $$b"; $$b; done
 
