@@ -1,5 +1,5 @@
-// The pixel kernel's body: the fourteen stages over one group of lanes, in their fixed order, each
-// gated by its flag. Included once per processor target (see kernel_simd_internal.h); reads only
+// The pixel kernel's body: the fourteen stages in their fixed order, each gated by its flag, over
+// blocks of lane groups. Included once per processor target (see kernel_simd_internal.h); reads only
 // EngineParams and the tables, allocates nothing and takes no locks.
 //
 // Weighted sums over the three luma ranges are gathered before they are applied (Σ W c_r = c Σ W_r,
