@@ -3,10 +3,11 @@ SHELL := /bin/bash
 JOBS ?= $(shell nproc)
 BUILD ?= build
 ASAN_BUILD ?= build-asan
+TSAN_BUILD ?= build-tsan
 WIN_BUILD ?= build-win
 CMAKE_FLAGS ?=
 
-.PHONY: all deps build demo test test-plain test-asan windows test-windows fuzz bench clean
+.PHONY: all deps build demo test test-plain test-asan test-tsan windows test-windows fuzz bench clean
 
 all: build
 
@@ -32,7 +33,15 @@ test-asan: deps $(ASAN_BUILD)/build.ninja
 	cmake --build $(ASAN_BUILD) -j $(JOBS)
 	ASAN_OPTIONS=detect_leaks=1 UBSAN_OPTIONS=print_stacktrace=1 ctest --test-dir $(ASAN_BUILD) --output-on-failure -j $(JOBS)
 
-test: test-plain test-asan
+$(TSAN_BUILD)/build.ninja:
+	cmake -S . -B $(TSAN_BUILD) -G Ninja -DCMAKE_BUILD_TYPE=RelWithDebInfo -DVT_WERROR=ON -DVT_SANITIZE_THREAD=ON -DVT_BUILD_BENCH=OFF -DVT_BUILD_TOOLS=OFF $(CMAKE_FLAGS)
+
+# Renders and parameter changes on several threads, under ThreadSanitizer.
+test-tsan: deps $(TSAN_BUILD)/build.ninja
+	cmake --build $(TSAN_BUILD) -j $(JOBS) --target velatone3 vt_integration_tests
+	TSAN_OPTIONS="halt_on_error=1 second_deadlock_stack=1" $(TSAN_BUILD)/tests/integration/vt_integration_tests --gtest_filter='ConcurrentRenders*:Locks*'
+
+test: test-plain test-asan test-tsan
 
 $(WIN_BUILD)/build.ninja:
 	@bash scripts/deps.sh windows
@@ -71,4 +80,4 @@ bench: build
 	@for b in $(BUILD)/bench/*_bench; do echo "== $$b"; $$b; done
 
 clean:
-	rm -rf $(BUILD) $(ASAN_BUILD) $(WIN_BUILD)
+	rm -rf $(BUILD) $(ASAN_BUILD) $(TSAN_BUILD) $(WIN_BUILD)

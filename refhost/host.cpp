@@ -2,6 +2,7 @@
 
 #include <cstdio>
 #include <algorithm>
+#include <atomic>
 #include <cstring>
 
 #include "refhost/effect_instance.h"
@@ -12,9 +13,9 @@ namespace refhost {
 
 namespace {
 
-Host* g_current = nullptr;  // the host the module's C callbacks reach
+std::atomic<Host*> g_current{nullptr};  // the host the module's C callbacks reach
 
-Host& Current() { return *g_current; }
+Host& Current() { return *g_current.load(); }
 
 // ---- utility callbacks: host memory handles
 
@@ -245,7 +246,7 @@ void HookAbout(void*, void*) { Current().RecordAbout(); }
 
 }  // namespace
 
-Host* Host::Current() { return g_current; }
+Host* Host::Current() { return g_current.load(); }
 
 Host::Host(HostPersona persona) : m_persona(std::move(persona)) {
     g_current = this;
@@ -272,7 +273,8 @@ Host::~Host() {
         if (def.param_type == PF_Param_ARBITRARY_DATA) m_heap.Dispose(def.u.arb_d.dephault);
     }
     UnloadModule();
-    if (g_current == this) g_current = nullptr;
+    Host* self = this;
+    g_current.compare_exchange_strong(self, nullptr);
 }
 
 void Host::InitInData() {
@@ -347,11 +349,28 @@ void Host::InstallPlatformHooks() {
 PF_Err Host::Call(PF_Cmd cmd, PF_ParamDef** params, PF_LayerDef* output, void* extra) {
     g_current = this;
     if (!m_entry) return PF_Err_INVALID_CALLBACK;
-    return m_entry(cmd, &m_inData, &m_outData, params, output, extra);
+    // Each call gets its own copy of the blocks, as a host calling from several threads does; what
+    // the module wrote into them is kept afterwards.
+    PF_InData inData;
+    PF_OutData outData;
+    {
+        std::lock_guard<std::mutex> guard(m_blocksMutex);
+        inData = m_inData;
+        outData = m_outData;
+    }
+    const PF_Err err = m_entry(cmd, &inData, &outData, params, output, extra);
+    std::lock_guard<std::mutex> guard(m_blocksMutex);
+    m_inData = inData;
+    m_outData = outData;
+    return err;
 }
 
 PF_InData Host::MakeInData(CallContext* context, PF_Handle sequence) const {
-    PF_InData inData = m_inData;
+    PF_InData inData;
+    {
+        std::lock_guard<std::mutex> guard(m_blocksMutex);
+        inData = m_inData;
+    }
     inData.effect_ref = reinterpret_cast<PF_ProgPtr>(context);
     inData.sequence_data = sequence;
     inData.num_params = static_cast<A_long>(m_paramDefs.size());
@@ -361,7 +380,11 @@ PF_InData Host::MakeInData(CallContext* context, PF_Handle sequence) const {
 PF_Err Host::CallWith(PF_InData* inData, PF_Cmd cmd, PF_ParamDef** params, PF_LayerDef* output, void* extra) {
     g_current = this;
     if (!m_entry) return PF_Err_INVALID_CALLBACK;
-    PF_OutData out = m_outData;
+    PF_OutData out;
+    {
+        std::lock_guard<std::mutex> guard(m_blocksMutex);
+        out = m_outData;
+    }
     out.sequence_data = nullptr;
     const PF_Err err = m_entry(cmd, inData, &out, params, output, extra);
     m_lastOutSequence = out.sequence_data;

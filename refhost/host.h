@@ -155,6 +155,7 @@ private:
     thread_local static inline PF_Handle m_lastOutSequence = nullptr;
     thread_local static inline PF_OutFlags m_lastOutFlags = 0;
 
+    mutable std::mutex m_blocksMutex;  // guards m_inData and m_outData while calls copy them
     PF_InData m_inData{};
     PF_OutData m_outData{};
     PF_UtilCallbacks m_utils{};
