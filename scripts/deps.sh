@@ -6,7 +6,10 @@ what=${1:-all}
 
 native=(cmake ninja-build g++ make pkg-config libgtest-dev googletest libgmock-dev libbenchmark-dev
         libpng-dev libopenimageio-dev openimageio-tools libcairo2-dev libcli11-dev clang libclang-rt-dev)
-windows=(g++-mingw-w64-x86-64 binutils-mingw-w64-x86-64 wine64 wine)
+# The cross-build also compiles one small program for the build machine (the resource-script writer)
+# and needs the posix-thread variant of the cross compiler (std::thread, std::mutex).
+windows=(cmake ninja-build make g++ g++-mingw-w64-x86-64 g++-mingw-w64-x86-64-posix binutils-mingw-w64-x86-64
+         libcli11-dev googletest wine64 wine)
 
 case "$what" in
   native) want=("${native[@]}") ;;

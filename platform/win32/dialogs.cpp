@@ -35,14 +35,28 @@ UINT_PTR CALLBACK CentreDialogHook(HWND child, UINT message, WPARAM, LPARAM) {
     return 0;
 }
 
+// A chosen name without an extension gets the default one, as the system dialog adds it.
+void AddDefaultExtension(const char* extension, std::string* path) {
+    if (extension == nullptr || *extension == '\0') return;
+    const size_t slash = path->find_last_of("\\/");
+    const size_t dot = path->find_last_of('.');
+    if (dot != std::string::npos && (slash == std::string::npos || dot > slash)) return;
+    *path += '.';
+    *path += extension;
+}
+
 bool AskHook(const win32::InstalledHooks& installed, const FileDialogRequest& request, std::string* path,
              int* filterIndex) {
     const std::string filter = FilterText(request);
     const char* answer = installed.hooks.fileDialog(installed.hooks.context, request.save ? 1 : 0, filter.c_str(),
                                                     request.title ? request.title : "");
-    if (answer == nullptr || *answer == '\0' || std::strlen(answer) >= kDialogPathSize) return false;
-    *path = answer;
-    if (filterIndex) *filterIndex = FilterIndexForPath(request, *path);
+    if (answer == nullptr || *answer == '\0') return false;
+    std::string chosen = answer;
+    AddDefaultExtension(request.defaultExtension, &chosen);
+    // The system dialog cannot hand back a longer path than its buffer holds.
+    if (chosen.size() >= kDialogPathSize) return false;
+    *path = chosen;
+    if (filterIndex) *filterIndex = FilterIndexForPath(request, chosen);
     return true;
 }
 
