@@ -263,16 +263,11 @@ TEST(SettingsPreset, AuxiliaryRecordsKeepWordsThreeAndThirteenToEighteen) {
     }
 }
 
-TEST(SettingsPreset, EveryKnownTagInOneFileMerges) {
-    auto s = test::ResetRecord();
-    ASSERT_EQ(MergeSettingsPreset(DataBytes("settings_preset/every-tag.vtpreset"), s.get()), FileResult::kOk);
-    EXPECT_EQ(s->autoCorrectA, std::bit_cast<float>((43u << 16) + 0));
-    EXPECT_EQ(s->hueCurvesEnable, 42u << 16);
-}
-
 TEST(SettingsPreset, SectionsAreFramedSafely) {
     // Skipped tags go by their length; a known tag by its own size whatever its length says.
-    EXPECT_EQ(MergeChanges(Preset().Section(11, {9, 9}).Section(24, {1})), (std::map<size_t, uint32_t>{{33376, 1}}));
+    EXPECT_EQ(MergeChanges(
+                  Preset().Section(11, {9, 9}).Section(34, {9}).Section(38, {}).Section(44, {9, 9, 9}).Section(24, {1})),
+              (std::map<size_t, uint32_t>{{33376, 1}}));
     EXPECT_EQ(MergeChanges(Preset().Section(24, {1}, 100).Section(14, {1})),
               (std::map<size_t, uint32_t>{{33376, 1}, {4, 1}}));
     // A length past the end of the file, or one that would read negative as a signed number,
