@@ -1,10 +1,13 @@
 #include "refhost/effect_instance.h"
 
+#include <algorithm>
 #include <cstring>
 
 namespace refhost {
 
 namespace {
+
+constexpr A_short kParametersArbId = 1;
 
 PF_Handle CopyHandle(HandleHeap& heap, PF_Handle source) {
     if (!source) return nullptr;
@@ -23,16 +26,186 @@ EffectInstance::EffectInstance(Host& host) : m_host(host) {
     m_context = {&host, this, nullptr};
     m_params = host.paramDefs();
     for (PF_ParamDef& def : m_params) {
-        // Each instance holds its own value of every arbitrary parameter, starting as the default.
-        if (def.param_type == PF_Param_ARBITRARY_DATA) def.u.arb_d.value = CopyHandle(host.heap(), def.u.arb_d.dephault);
+        // Each instance holds its own value of every arbitrary parameter: a copy of the default,
+        // made by the effect as hosts ask it to.
+        if (def.param_type == PF_Param_ARBITRARY_DATA) {
+            def.u.arb_d.value = CopyValue(def.u.arb_d.id, def.u.arb_d.dephault);
+            if (!def.u.arb_d.value) def.u.arb_d.value = CopyHandle(host.heap(), def.u.arb_d.dephault);
+        }
     }
 }
 
 EffectInstance::~EffectInstance() {
     if (m_sequence) Setdown();
+    for (auto& [frame, value] : m_keyframes) DisposeValue(kParametersArbId, value);
     for (PF_ParamDef& def : m_params) {
-        if (def.param_type == PF_Param_ARBITRARY_DATA) m_host.heap().Dispose(def.u.arb_d.value);
+        if (def.param_type == PF_Param_ARBITRARY_DATA) DisposeValue(def.u.arb_d.id, def.u.arb_d.value);
     }
+}
+
+PF_Err EffectInstance::Arbitrary(PF_ArbParamsExtra* extra) {
+    CallContext context{&m_host, this, nullptr};
+    PF_InData inData = m_host.MakeInData(&context, m_sequence);
+    std::vector<PF_ParamDef*> pointers = PointerArray(m_params);
+    return m_host.CallWith(&inData, PF_Cmd_ARBITRARY_CALLBACK, pointers.data(), nullptr, extra);
+}
+
+PF_Handle EffectInstance::NewValue(A_short arbId, PF_Err* err) {
+    PF_ArbParamsExtra extra{};
+    PF_Handle result = nullptr;
+    extra.which_function = PF_Arbitrary_NEW_FUNC;
+    extra.id = arbId;
+    extra.u.new_func_params.arbPH = &result;
+    const PF_Err e = Arbitrary(&extra);
+    if (err) *err = e;
+    return e == PF_Err_NONE ? result : nullptr;
+}
+
+PF_Handle EffectInstance::CopyValue(A_short arbId, PF_Handle source, PF_Err* err) {
+    PF_ArbParamsExtra extra{};
+    PF_Handle result = nullptr;
+    extra.which_function = PF_Arbitrary_COPY_FUNC;
+    extra.id = arbId;
+    extra.u.copy_func_params.src_arbH = source;
+    extra.u.copy_func_params.dst_arbPH = &result;
+    const PF_Err e = Arbitrary(&extra);
+    if (err) *err = e;
+    return e == PF_Err_NONE ? result : nullptr;
+}
+
+void EffectInstance::DisposeValue(A_short arbId, PF_Handle value) {
+    if (!value) return;
+    PF_ArbParamsExtra extra{};
+    extra.which_function = PF_Arbitrary_DISPOSE_FUNC;
+    extra.id = arbId;
+    extra.u.dispose_func_params.arbH = value;
+    // A module that cannot answer leaves the value to the host.
+    if (Arbitrary(&extra) != PF_Err_NONE || m_host.heap().IsLive(value)) m_host.heap().Dispose(value);
+}
+
+PF_Err EffectInstance::FlattenValue(A_short arbId, PF_Handle value, std::vector<uint8_t>* flat) {
+    PF_ArbParamsExtra extra{};
+    A_u_long size = 0;
+    extra.which_function = PF_Arbitrary_FLAT_SIZE_FUNC;
+    extra.id = arbId;
+    extra.u.flat_size_func_params.arbH = value;
+    extra.u.flat_size_func_params.flat_data_sizePLu = &size;
+    if (const PF_Err err = Arbitrary(&extra)) return err;
+    flat->assign(size, 0);
+    extra = PF_ArbParamsExtra{};
+    extra.which_function = PF_Arbitrary_FLATTEN_FUNC;
+    extra.id = arbId;
+    extra.u.flatten_func_params.arbH = value;
+    extra.u.flatten_func_params.buf_sizeLu = size;
+    extra.u.flatten_func_params.flat_dataPV = flat->data();
+    return Arbitrary(&extra);
+}
+
+PF_Handle EffectInstance::UnflattenValue(A_short arbId, const std::vector<uint8_t>& flat, PF_Err* err) {
+    PF_ArbParamsExtra extra{};
+    PF_Handle result = nullptr;
+    extra.which_function = PF_Arbitrary_UNFLATTEN_FUNC;
+    extra.id = arbId;
+    extra.u.unflatten_func_params.buf_sizeLu = static_cast<A_u_long>(flat.size());
+    extra.u.unflatten_func_params.flat_dataPV = flat.data();
+    extra.u.unflatten_func_params.arbPH = &result;
+    const PF_Err e = Arbitrary(&extra);
+    if (err) *err = e;
+    return e == PF_Err_NONE ? result : nullptr;
+}
+
+PF_Err EffectInstance::CompareValues(A_short arbId, PF_Handle a, PF_Handle b, PF_ArbCompareResult* result) {
+    PF_ArbParamsExtra extra{};
+    extra.which_function = PF_Arbitrary_COMPARE_FUNC;
+    extra.id = arbId;
+    extra.u.compare_func_params.a_arbH = a;
+    extra.u.compare_func_params.b_arbH = b;
+    extra.u.compare_func_params.compareP = result;
+    return Arbitrary(&extra);
+}
+
+PF_Err EffectInstance::PrintValue(A_short arbId, PF_Handle value, std::string* text) {
+    PF_ArbParamsExtra extra{};
+    A_u_long size = 0;
+    extra.which_function = PF_Arbitrary_PRINT_SIZE_FUNC;
+    extra.id = arbId;
+    extra.u.print_size_func_params.arbH = value;
+    extra.u.print_size_func_params.print_sizePLu = &size;
+    if (const PF_Err err = Arbitrary(&extra)) return err;
+    std::vector<char> buffer(size + 1, '\0');
+    extra = PF_ArbParamsExtra{};
+    extra.which_function = PF_Arbitrary_PRINT_FUNC;
+    extra.id = arbId;
+    extra.u.print_func_params.print_flags = PF_ArbPrint_NONE;
+    extra.u.print_func_params.arbH = value;
+    extra.u.print_func_params.print_sizeLu = size;
+    extra.u.print_func_params.print_bufferPC = buffer.data();
+    if (const PF_Err err = Arbitrary(&extra)) return err;
+    text->assign(buffer.data(), strnlen(buffer.data(), size));
+    return PF_Err_NONE;
+}
+
+PF_Handle EffectInstance::ScanValue(A_short arbId, const std::string& text, PF_Err* err) {
+    PF_ArbParamsExtra extra{};
+    PF_Handle result = nullptr;
+    extra.which_function = PF_Arbitrary_SCAN_FUNC;
+    extra.id = arbId;
+    extra.u.scan_func_params.bufPC = text.data();
+    extra.u.scan_func_params.bytes_to_scanLu = static_cast<A_u_long>(text.size());
+    extra.u.scan_func_params.arbPH = &result;
+    const PF_Err e = Arbitrary(&extra);
+    if (err) *err = e;
+    return e == PF_Err_NONE ? result : nullptr;
+}
+
+PF_Handle EffectInstance::InterpolateValues(A_short arbId, PF_Handle left, PF_Handle right, double t, PF_Err* err) {
+    PF_ArbParamsExtra extra{};
+    PF_Handle result = nullptr;
+    extra.which_function = PF_Arbitrary_INTERP_FUNC;
+    extra.id = arbId;
+    extra.u.interp_func_params.left_arbH = left;
+    extra.u.interp_func_params.right_arbH = right;
+    extra.u.interp_func_params.tF = t;
+    extra.u.interp_func_params.interpPH = &result;
+    const PF_Err e = Arbitrary(&extra);
+    if (err) *err = e;
+    return e == PF_Err_NONE ? result : nullptr;
+}
+
+void EffectInstance::SetKeyframes(const std::vector<std::pair<int, std::vector<uint8_t>>>& keys) {
+    for (auto& [frame, value] : m_keyframes) DisposeValue(kParametersArbId, value);
+    m_keyframes.clear();
+    for (const auto& [frame, bytes] : keys) {
+        // Keyframe values come from the project as flat bytes: the effect unflattens them.
+        if (PF_Handle value = UnflattenValue(kParametersArbId, bytes)) m_keyframes.emplace_back(frame, value);
+    }
+    std::sort(m_keyframes.begin(), m_keyframes.end(),
+              [](const auto& a, const auto& b) { return a.first < b.first; });
+}
+
+PF_Err EffectInstance::SetTimeFromKeyframes(int frame) {
+    if (m_keyframes.empty()) return PF_Err_NONE;
+    PF_Handle value = nullptr;
+    PF_Err err = PF_Err_NONE;
+    if (frame <= m_keyframes.front().first) {
+        value = CopyValue(kParametersArbId, m_keyframes.front().second, &err);
+    } else if (frame >= m_keyframes.back().first) {
+        value = CopyValue(kParametersArbId, m_keyframes.back().second, &err);
+    } else {
+        size_t k = 1;
+        while (m_keyframes[k].first < frame) ++k;
+        const auto& [leftFrame, left] = m_keyframes[k - 1];
+        const auto& [rightFrame, right] = m_keyframes[k];
+        const double t = static_cast<double>(frame - leftFrame) / static_cast<double>(rightFrame - leftFrame);
+        value = InterpolateValues(kParametersArbId, left, right, t, &err);
+    }
+    if (!value) return err != PF_Err_NONE ? err : PF_Err_OUT_OF_MEMORY;
+    const int index = IndexOfId(1);
+    std::lock_guard<std::mutex> guard(m_mutex);
+    PF_Handle& slot = m_params[static_cast<size_t>(index)].u.arb_d.value;
+    m_host.heap().Dispose(slot);
+    slot = value;
+    return PF_Err_NONE;
 }
 
 std::vector<PF_ParamDef*> EffectInstance::PointerArray(std::vector<PF_ParamDef>& params) {

@@ -64,6 +64,25 @@ public:
     std::vector<uint8_t> Settings() const;
     void SetSettings(const std::vector<uint8_t>& bytes);
 
+    // The arbitrary values, handled as a host does: through the effect's own callbacks.
+    // A new value of the arbitrary parameter with this id (null on failure).
+    PF_Handle NewValue(A_short arbId, PF_Err* err = nullptr);
+    PF_Handle CopyValue(A_short arbId, PF_Handle source, PF_Err* err = nullptr);
+    void DisposeValue(A_short arbId, PF_Handle value);
+    // Flat bytes of a value, as saved in a project.
+    PF_Err FlattenValue(A_short arbId, PF_Handle value, std::vector<uint8_t>* flat);
+    PF_Handle UnflattenValue(A_short arbId, const std::vector<uint8_t>& flat, PF_Err* err = nullptr);
+    PF_Err CompareValues(A_short arbId, PF_Handle a, PF_Handle b, PF_ArbCompareResult* result);
+    // The text form for copy and paste.
+    PF_Err PrintValue(A_short arbId, PF_Handle value, std::string* text);
+    PF_Handle ScanValue(A_short arbId, const std::string& text, PF_Err* err = nullptr);
+    PF_Handle InterpolateValues(A_short arbId, PF_Handle left, PF_Handle right, double t, PF_Err* err = nullptr);
+
+    // Keyframes of the "Parameters" value: settings records at frames. Renders of a frame take the
+    // value the effect interpolates there (held before the first key and after the last).
+    void SetKeyframes(const std::vector<std::pair<int, std::vector<uint8_t>>>& keys);
+    PF_Err SetTimeFromKeyframes(int frame);
+
     PF_Err SmartRender(World& input, World& output, RenderJob* job = nullptr);
     // The classic render; hints default to the whole worlds.
     PF_Err Render(World& input, World& output, const PF_Rect* inputHint = nullptr, const PF_Rect* outputHint = nullptr);
@@ -77,6 +96,7 @@ public:
 private:
     PF_Err CallLocked(PF_Cmd cmd, void* extra, PF_ParamDef** params = nullptr, PF_LayerDef* output = nullptr,
                       RenderJob* job = nullptr);
+    PF_Err Arbitrary(PF_ArbParamsExtra* extra);
     std::vector<PF_ParamDef*> PointerArray(std::vector<PF_ParamDef>& params);
     // Copies of the parameters for one render, with their own copy of each arbitrary value.
     std::vector<PF_ParamDef> SnapshotParams();
@@ -87,6 +107,7 @@ private:
     PF_Handle m_sequence = nullptr;
     mutable std::mutex m_mutex;  // guards m_params, m_sequence for calls from several threads
     std::vector<PF_ParamDef> m_params;
+    std::vector<std::pair<int, PF_Handle>> m_keyframes;  // frame, flat-loaded value; in frame order
 };
 
 }  // namespace refhost

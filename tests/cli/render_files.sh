@@ -82,6 +82,41 @@ check "sequence" bash -c "
   '$velatone' render '$work/seq/in.####.png' '$work/seq/out.####.png' --set 'HSL/Master/Hue=30'
   for f in 1 2 3; do cmp '$work/seq/out.0001.png' '$work/seq/out.000'\$f'.png'; done"
 
+# Presets, curve and LUT files, keyframes, and the settings command.
+samples="$source/tests/data"
+acv=$(ls "$samples"/point_curve/*.acv | head -n 1)
+lut=$(ls "$samples"/autodesk_lut/*.lut | grep -v -i error | head -n 1)
+check "curves change the image" bash -c "
+  set -e
+  '$velatone' render '$scene' '$work/c1.png' --curves '$acv'
+  ! cmp -s '$work/c1.png' '$work/id.png'
+  '$velatone' render '$scene' '$work/c2.png' --curves '$lut'"
+check "settings: flat record, text form, round trips" bash -c "
+  set -e
+  '$velatone' settings --set 'HSL/Midtones/Gamma=1.4' --curves '$acv' --out '$work/s1.settings'
+  '$velatone' settings --settings '$work/s1.settings' --print > '$work/s1.txt'
+  head -c 14 '$work/s1.txt' | grep -q '^Velatone.8389'
+  '$velatone' settings --scan '$work/s1.txt' --out '$work/s2.settings'
+  cmp '$work/s1.settings' '$work/s2.settings'
+  '$velatone' settings --settings '$work/s1.settings' --diff | grep -q 'tone curves'
+  '$velatone' settings --settings '$work/s1.settings' --save-curves '$work/s1.acv'
+  '$velatone' settings --curves '$work/s1.acv' --out '$work/s3.settings'"
+check "keyframes interpolate between their records" bash -c "
+  set -e
+  '$velatone' settings --set 'HSL/Master/Saturation=0' --out '$work/k1.settings'
+  '$velatone' settings --set 'HSL/Master/Saturation=200' --out '$work/k2.settings'
+  '$velatone' render '$work/seq/in.####.png' '$work/seq/key.####.png' --key 1:'$work/k1.settings' --key 3:'$work/k2.settings'
+  '$velatone' render '$scene' '$work/k-first.png' --settings '$work/k1.settings'
+  '$velatone' render '$scene' '$work/k-last.png' --settings '$work/k2.settings'
+  '$velatone' render '$scene' '$work/k-mid.png' --set 'HSL/Master/Saturation=100' --set 'HSL/Master/Hue=0'
+  cmp '$work/seq/key.0001.png' '$work/k-first.png'
+  cmp '$work/seq/key.0003.png' '$work/k-last.png'
+  ! cmp -s '$work/seq/key.0002.png' '$work/k-first.png'
+  ! cmp -s '$work/seq/key.0002.png' '$work/k-last.png'"
+fails "truncated LUT" "result: -39" "$velatone" render "$scene" "$work/x.png" --curves "$source/tests/data/autodesk_lut/error_truncated_file.lut"
+fails "not a preset" "result: -2041" bash -c "echo 'hello' > '$work/bad.vtpreset'; '$velatone' render '$scene' '$work/x.png' --preset '$work/bad.vtpreset'"
+fails "one key" "twice" "$velatone" render "$scene" "$work/x.png" --key "1:$work/k1.settings"
+
 fails "unknown parameter" "no parameter \"HSL/Master/Nope\"" "$velatone" render "$scene" "$work/x.png" --set "HSL/Master/Nope=1"
 fails "out of range" "takes 0 to 300" "$velatone" render "$scene" "$work/x.png" --set "HSL/Master/Saturation=400"
 fails "bad popup" "is not a choice" "$velatone" render "$scene" "$work/x.png" --set "Limiter/Video System=SECAM"

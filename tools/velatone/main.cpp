@@ -5,6 +5,7 @@
 #include "tools/velatone/info_command.h"
 #if VT_HAVE_IMAGE_IO
 #include "tools/velatone/render_command.h"
+#include "tools/velatone/settings_command.h"
 #endif
 
 int main(int argc, char** argv) {
@@ -17,12 +18,15 @@ int main(int argc, char** argv) {
     velatone::AddRenderCommand(app, render);
     velatone::ParamsOptions params;
     velatone::AddParamsCommand(app, params);
+    velatone::SettingsOptions settings;
+    velatone::AddSettingsCommand(app, settings);
 #endif
     CLI11_PARSE(app, argc, argv);
     if (app.got_subcommand("info")) return velatone::RunInfo(info);
 #if VT_HAVE_IMAGE_IO
     if (app.got_subcommand("render")) return velatone::RunRender(render);
     if (app.got_subcommand("params")) return velatone::RunParams(params);
+    if (app.got_subcommand("settings")) return velatone::RunSettings(settings);
 #endif
     return 0;
 }

@@ -18,33 +18,12 @@
 #include "refhost/effect_instance.h"
 #include "refhost/module_file.h"
 #include "refhost/world.h"
+#include "tools/velatone/grade.h"
 #include "tools/velatone/image_io.h"
 
 namespace velatone {
 
 namespace {
-
-constexpr size_t kSettingsSize = 33556;
-
-struct Failure {
-    std::string message;
-};
-
-std::vector<uint8_t> ReadFileBytes(const std::string& path) {
-    std::ifstream in(path, std::ios::binary);
-    if (!in) throw Failure{"cannot open " + path};
-    return std::vector<uint8_t>((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
-}
-
-void WriteFileBytes(const std::string& path, const std::vector<uint8_t>& bytes) {
-    const std::string partial = path + ".partial";
-    {
-        std::ofstream out(partial, std::ios::binary | std::ios::trunc);
-        out.write(reinterpret_cast<const char*>(bytes.data()), static_cast<std::streamsize>(bytes.size()));
-        if (!out) throw Failure{"cannot write " + path};
-    }
-    if (std::rename(partial.c_str(), path.c_str()) != 0) throw Failure{"cannot write " + path};
-}
 
 // Which hosts can hand over which worlds: After Effects through its world suite, the Premiere
 // family through its pixel-format suite, every other host 8- or 16-bit ARGB by the deep flag.
@@ -81,62 +60,6 @@ void PresentColourSpaceKey() {
     setenv("VELATONE_REGISTRY", path.c_str(), 1);
 }
 
-// Parses "Group/Name=value" and sets it as a user would.
-void ApplySet(refhost::EffectInstance& instance, const std::string& assignment) {
-    const size_t equals = assignment.rfind('=');
-    if (equals == std::string::npos) throw Failure{"--set takes \"Group/Name=value\", not \"" + assignment + "\""};
-    const std::string path = assignment.substr(0, equals);
-    const std::string text = assignment.substr(equals + 1);
-    const int index = instance.FindByPath(path);
-    if (index <= 0) throw Failure{"no parameter \"" + path + "\" (see velatone params)"};
-    const PF_ParamDef& def = instance.param(index);
-    double value = 0;
-    if (def.param_type == PF_Param_POPUP) {
-        // A choice by its name or its number (from 1).
-        std::stringstream choices(def.u.pd.u.namesptr ? def.u.pd.u.namesptr : "");
-        std::string choice;
-        for (int number = 1; std::getline(choices, choice, '|'); ++number) {
-            if (choice == text) value = number;
-        }
-        if (value == 0) value = std::atoi(text.c_str());
-        if (value < 1 || value > def.u.pd.num_choices) throw Failure{"\"" + text + "\" is not a choice of " + path};
-    } else if (def.param_type == PF_Param_CHECKBOX) {
-        if (text == "on" || text == "true" || text == "1") value = 1;
-        else if (text == "off" || text == "false" || text == "0") value = 0;
-        else throw Failure{path + " takes on or off, not \"" + text + "\""};
-    } else if (def.param_type == PF_Param_FLOAT_SLIDER) {
-        char* end = nullptr;
-        value = std::strtod(text.c_str(), &end);
-        if (text.empty() || *end != '\0') throw Failure{path + " takes a number, not \"" + text + "\""};
-        if (value < def.u.fs_d.valid_min || value > def.u.fs_d.valid_max) {
-            char range[96];
-            std::snprintf(range, sizeof range, "%g to %g", static_cast<double>(def.u.fs_d.valid_min),
-                          static_cast<double>(def.u.fs_d.valid_max));
-            throw Failure{path + " takes " + range + ", not " + text};
-        }
-    } else {
-        throw Failure{path + " is not a value a user sets"};
-    }
-    if (instance.SetValue(index, value) != PF_Err_NONE) throw Failure{"the effect refused " + assignment};
-}
-
-// The sliders follow a settings record loaded whole, as the effect's own Load button makes them.
-void SyncSlidersToSettings(refhost::EffectInstance& instance) {
-    vt::GlobalState tables{};
-    const std::vector<uint32_t>& ids = instance.host().paramIds();
-    for (size_t index = 1; index < ids.size() && index < vt::kParamTableSize; ++index) {
-        tables.indexToId[index] = ids[index];
-        if (ids[index] < vt::kParamTableSize) tables.idToIndex[ids[index]] = static_cast<uint32_t>(index);
-    }
-    const std::vector<uint8_t> bytes = instance.Settings();
-    vt::CorrectionSettings settings;
-    std::memcpy(&settings, bytes.data(), sizeof settings);
-    std::vector<PF_ParamDef*> params;
-    for (int i = 0; i < instance.count(); ++i) params.push_back(&instance.param(i));
-    vt::SettingsToParams(settings, params.data(), &tables);
-    instance.TakeChangedParams();
-}
-
 void Progress(size_t done, size_t total, const std::string& name) {
     constexpr int kWidth = 30;
     const int filled = static_cast<int>(kWidth * done / (total ? total : 1));
@@ -154,15 +77,20 @@ int Run(const RenderOptions& options) {
         throw Failure{"--api takes MAJOR.MINOR, not \"" + options.api + "\""};
     }
 
-    std::vector<std::pair<std::string, std::string>> frames;  // input, output
+    struct Frame {
+        std::string first;   // input
+        std::string second;  // output
+        int frame;
+    };
+    std::vector<Frame> frames;
     if (IsSequencePattern(options.input)) {
         if (!IsSequencePattern(options.output)) throw Failure{"a frame sequence needs a numbered output (out.####.ext)"};
         for (int frame : ExistingFrames(options.input)) {
-            frames.emplace_back(FramePath(options.input, frame), FramePath(options.output, frame));
+            frames.push_back({FramePath(options.input, frame), FramePath(options.output, frame), frame});
         }
         if (frames.empty()) throw Failure{"no frames match " + options.input};
     } else {
-        frames.emplace_back(options.input, options.output);
+        frames.push_back({options.input, options.output, 0});
     }
 
     Image first;
@@ -189,16 +117,19 @@ int Run(const RenderOptions& options) {
     {
         refhost::EffectInstance instance(host);
         if (instance.Setup() != PF_Err_NONE) throw Failure{"the effect's sequence setup failed"};
-        if (!options.settingsFile.empty()) {
-            const std::vector<uint8_t> bytes = ReadFileBytes(options.settingsFile);
-            if (bytes.size() != kSettingsSize) {
-                throw Failure{options.settingsFile + " holds " + std::to_string(bytes.size()) +
-                              " bytes; a settings record holds 33556"};
+        ApplyGrade(instance, options.grade);
+        std::vector<std::pair<int, std::vector<uint8_t>>> keys;
+        for (const std::string& key : options.keys) {
+            const size_t colon = key.find(':');
+            char* end = nullptr;
+            const long frame = colon == std::string::npos ? 0 : std::strtol(key.c_str(), &end, 10);
+            if (colon == std::string::npos || end != key.c_str() + colon || colon == 0) {
+                throw Failure{"--key takes FRAME:SETTINGS_OR_PRESET, not \"" + key + "\""};
             }
-            instance.SetSettings(bytes);
-            SyncSlidersToSettings(instance);
+            keys.emplace_back(static_cast<int>(frame), RecordFromFile(instance, key.substr(colon + 1)));
         }
-        for (const std::string& assignment : options.sets) ApplySet(instance, assignment);
+        if (!keys.empty() && keys.size() < 2) throw Failure{"keyframes need --key at least twice"};
+        instance.SetKeyframes(keys);
 
         for (size_t i = 0; i < frames.size(); ++i) {
             Image image;
@@ -209,6 +140,14 @@ int Run(const RenderOptions& options) {
             }
             if (image.width != first.width || image.height != first.height) {
                 throw Failure{frames[i].first + " is not the size of the first frame"};
+            }
+            if (!keys.empty()) {
+                // The value at this frame is the effect's own interpolation of the keys; the
+                // sliders follow it, as they follow a keyframed value in a host.
+                if (instance.SetTimeFromKeyframes(frames[i].frame) != PF_Err_NONE) {
+                    throw Failure{"the effect could not interpolate the keys at frame " + std::to_string(frames[i].frame)};
+                }
+                SyncSlidersToSettings(instance);
             }
             refhost::World input(layout, image.width, image.height);
             refhost::World output(layout, image.width, image.height);
@@ -232,8 +171,9 @@ void AddRenderCommand(CLI::App& app, RenderOptions& options) {
     CLI::App* render = app.add_subcommand("render", "Grade an image file (or a frame sequence) with the effect");
     render->add_option("input", options.input, "Input image, or a sequence such as in.####.exr")->required();
     render->add_option("output", options.output, "Output image, or a sequence such as out.####.exr")->required();
-    render->add_option("--set", options.sets, "Set a parameter by its panel path: \"HSL/Master/Saturation=150\"");
-    render->add_option("--settings", options.settingsFile, "Use a 33,556-byte settings record as the \"Parameters\" value");
+    AddGradeOptions(*render, options.grade);
+    render->add_option("--key", options.keys,
+                       "A keyframe: FRAME:FILE with a settings record or a .vtpreset (twice or more)");
     render->add_option("--save-settings", options.saveSettings, "Write the settings record in force");
     render->add_option("--depth", options.depth, "World depth: 8, 16 or 32 (default: the image's own)")
         ->check(CLI::IsMember({8, 16, 32}));
@@ -244,6 +184,13 @@ void AddRenderCommand(CLI::App& app, RenderOptions& options) {
     render->add_option("--api", options.api, "Host API version, e.g. 12.10");
     render->add_flag("--classic", options.classic, "Use the classic (non-smart) render");
     render->add_option("--module", options.modulePath, "Module file (default: beside this program)");
+}
+
+void AddGradeOptions(CLI::App& command, GradeSources& sources) {
+    command.add_option("--settings", sources.settingsFile, "Start from a settings record (as --save-settings writes)");
+    command.add_option("--preset", sources.presets, "Merge a settings preset file (.vtpreset), as the Load button does");
+    command.add_option("--curves", sources.curves, "Load tone curves from a .acv, .amp, .lut or .txt file");
+    command.add_option("--set", sources.sets, "Set a parameter by its panel path: \"HSL/Master/Saturation=150\"");
 }
 
 int RunRender(const RenderOptions& options) {

@@ -5,6 +5,8 @@
 #include <string>
 #include <vector>
 
+#include "tools/velatone/grade.h"
+
 namespace CLI {
 class App;
 }
@@ -17,12 +19,12 @@ struct RenderOptions {
     std::string modulePath;
     std::string host = "aftereffects";
     std::string api;
-    std::string settingsFile;
+    GradeSources grade;
+    std::vector<std::string> keys;  // FRAME:FILE
     std::string saveSettings;
     std::string layout = "argb";
     int depth = 0;  // 0: the input image's own
     bool classic = false;
-    std::vector<std::string> sets;
 };
 
 struct ParamsOptions {
@@ -30,6 +32,8 @@ struct ParamsOptions {
     std::string host = "aftereffects";
 };
 
+// The options that build a grade, shared by render and settings.
+void AddGradeOptions(CLI::App& command, GradeSources& sources);
 void AddRenderCommand(CLI::App& app, RenderOptions& options);
 int RunRender(const RenderOptions& options);
 void AddParamsCommand(CLI::App& app, ParamsOptions& options);
