@@ -110,6 +110,15 @@ void Restore(const SavedKey& saved) {
     RegCloseKey(key);
 }
 
+// The system adds the terminator of a text whose caller "forgot" to count it when the byte after
+// the data is zero (wine does the same): a sentinel after the data keeps an unterminated text, which
+// some tests need, exactly as given.
+LSTATUS WriteValue(HKEY key, const std::string& name, uint32_t type, const std::vector<uint8_t>& bytes) {
+    std::vector<uint8_t> data(bytes);
+    data.push_back('!');
+    return RegSetValueExA(key, name.c_str(), 0, type, data.data(), static_cast<DWORD>(bytes.size()));
+}
+
 void RestoreAll(const TestRegistry* owner) {
     std::vector<SavedKey> saved;
     {
@@ -172,8 +181,7 @@ void TestRegistry::Apply() {
         DeleteValues(handle);
         for (const Value& value : m_values) {
             if (value.keyOnly || value.machine != key.machine || value.key != key.path) continue;
-            const LSTATUS written = RegSetValueExA(handle, value.name.c_str(), 0, value.type, value.bytes.data(),
-                                                   static_cast<DWORD>(value.bytes.size()));
+            const LSTATUS written = WriteValue(handle, value.name, value.type, value.bytes);
             if (written != ERROR_SUCCESS) Complain(("writing \"" + value.name + "\" in").c_str(), key.path, written);
         }
         RegCloseKey(handle);
