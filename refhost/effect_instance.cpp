@@ -43,6 +43,13 @@ EffectInstance::~EffectInstance() {
     }
 }
 
+// A value handed out with an error is the host's all the same: it is disposed of here.
+PF_Handle EffectInstance::KeepOnSuccess(PF_Err err, PF_Handle value) {
+    if (err == PF_Err_NONE) return value;
+    if (value && m_host.heap().IsLive(value)) m_host.heap().Dispose(value);
+    return nullptr;
+}
+
 PF_Err EffectInstance::Arbitrary(PF_ArbParamsExtra* extra) {
     CallContext context{&m_host, this, nullptr};
     PF_InData inData = m_host.MakeInData(&context, m_sequence);
@@ -58,7 +65,7 @@ PF_Handle EffectInstance::NewValue(A_short arbId, PF_Err* err) {
     extra.u.new_func_params.arbPH = &result;
     const PF_Err e = Arbitrary(&extra);
     if (err) *err = e;
-    return e == PF_Err_NONE ? result : nullptr;
+    return KeepOnSuccess(e, result);
 }
 
 PF_Handle EffectInstance::CopyValue(A_short arbId, PF_Handle source, PF_Err* err) {
@@ -70,7 +77,7 @@ PF_Handle EffectInstance::CopyValue(A_short arbId, PF_Handle source, PF_Err* err
     extra.u.copy_func_params.dst_arbPH = &result;
     const PF_Err e = Arbitrary(&extra);
     if (err) *err = e;
-    return e == PF_Err_NONE ? result : nullptr;
+    return KeepOnSuccess(e, result);
 }
 
 void EffectInstance::DisposeValue(A_short arbId, PF_Handle value) {
@@ -111,7 +118,7 @@ PF_Handle EffectInstance::UnflattenValue(A_short arbId, const std::vector<uint8_
     extra.u.unflatten_func_params.arbPH = &result;
     const PF_Err e = Arbitrary(&extra);
     if (err) *err = e;
-    return e == PF_Err_NONE ? result : nullptr;
+    return KeepOnSuccess(e, result);
 }
 
 PF_Err EffectInstance::CompareValues(A_short arbId, PF_Handle a, PF_Handle b, PF_ArbCompareResult* result) {
@@ -155,7 +162,7 @@ PF_Handle EffectInstance::ScanValue(A_short arbId, const std::string& text, PF_E
     extra.u.scan_func_params.arbPH = &result;
     const PF_Err e = Arbitrary(&extra);
     if (err) *err = e;
-    return e == PF_Err_NONE ? result : nullptr;
+    return KeepOnSuccess(e, result);
 }
 
 PF_Handle EffectInstance::InterpolateValues(A_short arbId, PF_Handle left, PF_Handle right, double t, PF_Err* err) {
@@ -169,7 +176,7 @@ PF_Handle EffectInstance::InterpolateValues(A_short arbId, PF_Handle left, PF_Ha
     extra.u.interp_func_params.interpPH = &result;
     const PF_Err e = Arbitrary(&extra);
     if (err) *err = e;
-    return e == PF_Err_NONE ? result : nullptr;
+    return KeepOnSuccess(e, result);
 }
 
 void EffectInstance::SetKeyframes(const std::vector<std::pair<int, std::vector<uint8_t>>>& keys) {

@@ -97,6 +97,7 @@ private:
     PF_Err CallLocked(PF_Cmd cmd, void* extra, PF_ParamDef** params = nullptr, PF_LayerDef* output = nullptr,
                       RenderJob* job = nullptr);
     PF_Err Arbitrary(PF_ArbParamsExtra* extra);
+    PF_Handle KeepOnSuccess(PF_Err err, PF_Handle value);
     std::vector<PF_ParamDef*> PointerArray(std::vector<PF_ParamDef>& params);
     // Copies of the parameters for one render, with their own copy of each arbitrary value.
     std::vector<PF_ParamDef> SnapshotParams();

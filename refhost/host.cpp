@@ -243,6 +243,9 @@ std::string SuiteKey(const char* name, int32_t version) { return std::string(nam
 void HookMessage(void*, const char* text, int kind) { Current().RecordMessage(text, kind); }
 void HookDebug(void*, const char* line) { Current().RecordDebug(line); }
 void HookAbout(void*, void*) { Current().RecordAbout(); }
+const char* HookFileDialog(void*, int save, const char* filter, const char* title) {
+    return Current().AnswerFileDialog(save, filter, title);
+}
 
 }  // namespace
 
@@ -341,6 +344,7 @@ void Host::InstallPlatformHooks() {
     sinks.message = HookMessage;
     sinks.debug = HookDebug;
     sinks.about = HookAbout;
+    sinks.fileDialog = HookFileDialog;
     sinks.commandLine = m_persona.commandLine.c_str();
     sinks.executablePath = m_persona.executablePath.c_str();
     InstallModuleSinks(m_library, sinks);
@@ -529,6 +533,20 @@ void Host::ClearRecords() {
     std::lock_guard<std::mutex> guard(m_recordMutex);
     m_messages.clear();
     m_debugLines.clear();
+}
+
+const char* Host::AnswerFileDialog(int /*save*/, const char* /*filter*/, const char* title) {
+    std::lock_guard<std::mutex> guard(m_recordMutex);
+    m_dialogsShown.emplace_back(title ? title : "");
+    if (m_dialogAnswers.empty()) return nullptr;
+    m_lastDialogAnswer = m_dialogAnswers.front();
+    m_dialogAnswers.erase(m_dialogAnswers.begin());
+    return m_lastDialogAnswer.c_str();
+}
+
+std::vector<std::string> Host::fileDialogsShown() const {
+    std::lock_guard<std::mutex> guard(m_recordMutex);
+    return m_dialogsShown;
 }
 
 void Host::Register(const char* name, int32_t* id) {

@@ -79,6 +79,11 @@ public:
     // Called on the module's thread for each message box, while the module waits for it to close.
     void SetMessageCallback(std::function<void(const Message&)> callback) { m_onMessage = std::move(callback); }
     int aboutBoxesShown() const { return m_aboutBoxes; }
+    // File dialogs the module opens are answered from this queue, in order; an empty queue cancels.
+    void QueueFileDialogAnswer(const std::string& path) { m_dialogAnswers.push_back(path); }
+    // The titles of the dialogs the module opened.
+    std::vector<std::string> fileDialogsShown() const;
+    const char* AnswerFileDialog(int save, const char* filter, const char* title);
     const std::vector<int32_t>& pixelFormats() const { return m_pixelFormats; }
     int pixelFormatClears() const { return m_pixelFormatClears; }
     const std::string& registeredName() const { return m_registeredName; }
@@ -170,6 +175,9 @@ private:
     bool m_echoMessages = true;
     std::function<void(const Message&)> m_onMessage;
     int m_aboutBoxes = 0;
+    std::vector<std::string> m_dialogAnswers;
+    std::vector<std::string> m_dialogsShown;
+    std::string m_lastDialogAnswer;
     std::vector<int32_t> m_pixelFormats;
     int m_pixelFormatClears = 0;
     std::string m_registeredName;

@@ -41,6 +41,8 @@ struct ModuleSinks {
     void (*about)(void* context, void* owner);
     const char* commandLine;
     const char* executablePath;
+    // Answers a file dialog: a path the host keeps until its next answer, or null for cancel.
+    const char* (*fileDialog)(void* context, int save, const char* filter, const char* title);
 };
 
 // Installs the sinks where the platform lets a host do so; elsewhere the module uses the system's own.

@@ -10,7 +10,6 @@
 #include <fstream>
 #include <iterator>
 
-#include "platform/host_hooks.h"
 
 namespace refhost {
 
@@ -98,18 +97,5 @@ void LoadedLibrary::Close() {
 
 void* LoadedLibrary::Symbol(const char* name) const { return m_handle ? dlsym(m_handle, name) : nullptr; }
 
-void InstallModuleSinks(const LoadedLibrary& library, const ModuleSinks& sinks) {
-    auto install = reinterpret_cast<VtInstallPlatformHooksProc>(library.Symbol(VT_PLATFORM_HOOKS_SYMBOL));
-    if (!install) return;
-    VtPlatformHooks hooks{};
-    hooks.size = sizeof hooks;
-    hooks.context = sinks.context;
-    hooks.message = sinks.message;
-    hooks.debug = sinks.debug;
-    hooks.about = sinks.about;
-    hooks.commandLine = sinks.commandLine;
-    hooks.executablePath = sinks.executablePath;
-    install(&hooks);
-}
 
 }  // namespace refhost

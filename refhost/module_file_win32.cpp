@@ -7,7 +7,6 @@
 
 #include <cstring>
 
-#include "platform/host_hooks.h"
 #include "sdk/pipl.h"
 
 namespace refhost {
@@ -87,18 +86,5 @@ void* LoadedLibrary::Symbol(const char* name) const {
     return m_handle ? reinterpret_cast<void*>(GetProcAddress(static_cast<HMODULE>(m_handle), name)) : nullptr;
 }
 
-void InstallModuleSinks(const LoadedLibrary& library, const ModuleSinks& sinks) {
-    auto install = reinterpret_cast<VtInstallPlatformHooksProc>(library.Symbol(VT_PLATFORM_HOOKS_SYMBOL));
-    if (!install) return;
-    VtPlatformHooks hooks{};
-    hooks.size = sizeof hooks;
-    hooks.context = sinks.context;
-    hooks.message = sinks.message;
-    hooks.debug = sinks.debug;
-    hooks.about = sinks.about;
-    hooks.commandLine = sinks.commandLine;
-    hooks.executablePath = sinks.executablePath;
-    install(&hooks);
-}
 
 }  // namespace refhost
