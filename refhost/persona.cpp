@@ -11,89 +11,60 @@ constexpr int32_t FourCC(const char (&c)[5]) {
                                 (uint32_t(uint8_t(c[2])) << 8) | uint32_t(uint8_t(c[3])));
 }
 
+struct PersonaRow {
+    const char* name;
+    const char* description;
+    const char* executablePath;
+    const char* arguments;  // after the quoted executable on the command line
+    int16_t apiMajor;
+    int16_t apiMinor;
+    int32_t applId;
+    bool memorySuite, worldSuite2, pixelFormatSuite, appSuite;
+    uint16_t background, text;  // grey levels of the panel
+};
+
+// The executable names are those the hosts install under; nothing in the unidentified host's names
+// matches an identification rule.
+constexpr PersonaRow kPersonas[] = {
+    {"aftereffects", "After Effects", "C:\\Program Files\\Adobe\\Adobe After Effects 2024\\Support Files\\AfterFX.exe",
+     "", 13, 28, FourCC("FXTC"), true, true, false, true, 0x2323, 0xC4C4},
+    {"premiere", "Premiere Pro", "C:\\Program Files\\Adobe\\Adobe Premiere Pro 2024\\Adobe Premiere Pro.exe", "", 13, 0,
+     FourCC("PrMr"), false, true, true, true, 0x3232, 0xD0D0},
+    {"mediaencoder", "Media Encoder", "C:\\Program Files\\Adobe\\Adobe Media Encoder 2024\\Adobe Media Encoder.exe", "",
+     13, 0, FourCC("PrMr"), false, true, true, true, 0x3232, 0xD0D0},
+    {"avid", "Avid Media Composer", "C:\\Program Files\\Avid\\Avid Media Composer\\AvidMediaComposer.exe", "", 13, 0, 0,
+     false, false, false, false, 0x8C8C, 0xD0D0},
+    {"boris", "Boris host", "C:\\Program Files\\BorisFX\\Boris FX\\BorisFX.exe", "", 13, 0, 0, false, false, false, false,
+     0x8C8C, 0xD0D0},
+    {"combustion", "Combustion", "C:\\Program Files\\Autodesk\\Combustion 2008\\combustion.exe", "", 13, 0, 0, false,
+     false, false, false, 0x8C8C, 0xD0D0},
+    {"commotion", "Commotion", "C:\\Program Files\\Commotion 4\\Commotion.exe", "", 13, 0, 0, false, false, false, false,
+     0x8C8C, 0xD0D0},
+    {"unknown", "unidentified host", "C:\\Tools\\GenHost\\genhost.exe", " -batch", 13, 0, 0, false, false, false, false,
+     0x8C8C, 0xD0D0},
+};
+
 std::vector<HostPersona> MakePersonas() {
     std::vector<HostPersona> personas;
-    HostPersona ae;
-    ae.name = "aftereffects";
-    ae.description = "After Effects";
-    ae.executablePath = "C:\\Program Files\\Adobe\\Adobe After Effects 2024\\Support Files\\AfterFX.exe";
-    ae.commandLine = "\"" + ae.executablePath + "\"";
-    ae.apiMajor = 13;
-    ae.apiMinor = 28;
-    ae.applId = FourCC("FXTC");
-    ae.memorySuite = true;
-    ae.worldSuite2 = true;
-    ae.appSuite = true;
-    ae.background[0] = ae.background[1] = ae.background[2] = 0x2323;
-    ae.text[0] = ae.text[1] = ae.text[2] = 0xC4C4;
-    personas.push_back(ae);
-
-    HostPersona pr;
-    pr.name = "premiere";
-    pr.description = "Premiere Pro";
-    pr.executablePath = "C:\\Program Files\\Adobe\\Adobe Premiere Pro 2024\\Adobe Premiere Pro.exe";
-    pr.commandLine = "\"" + pr.executablePath + "\"";
-    pr.apiMajor = 13;
-    pr.apiMinor = 0;
-    pr.applId = FourCC("PrMr");
-    pr.pixelFormatSuite = true;
-    pr.worldSuite2 = true;
-    pr.appSuite = true;
-    pr.background[0] = pr.background[1] = pr.background[2] = 0x3232;
-    personas.push_back(pr);
-
-    HostPersona me = pr;
-    me.name = "mediaencoder";
-    me.description = "Media Encoder";
-    me.executablePath = "C:\\Program Files\\Adobe\\Adobe Media Encoder 2024\\Adobe Media Encoder.exe";
-    me.commandLine = "\"" + me.executablePath + "\"";
-    personas.push_back(me);
-
-    HostPersona avid;
-    avid.name = "avid";
-    avid.description = "Avid Media Composer";
-    avid.executablePath = "C:\\Program Files\\Avid\\Avid Media Composer\\AvidMediaComposer.exe";
-    avid.commandLine = "\"" + avid.executablePath + "\"";
-    avid.apiMajor = 13;
-    avid.apiMinor = 0;
-    personas.push_back(avid);
-
-    HostPersona boris;
-    boris.name = "boris";
-    boris.description = "Boris host";
-    boris.executablePath = "C:\\Program Files\\BorisFX\\Boris FX\\BorisFX.exe";
-    boris.commandLine = "\"" + boris.executablePath + "\"";
-    boris.apiMajor = 13;
-    boris.apiMinor = 0;
-    personas.push_back(boris);
-
-    HostPersona combustion;
-    combustion.name = "combustion";
-    combustion.description = "Combustion";
-    combustion.executablePath = "C:\\Program Files\\Autodesk\\Combustion 2008\\combustion.exe";
-    combustion.commandLine = "\"" + combustion.executablePath + "\"";
-    combustion.apiMajor = 13;
-    combustion.apiMinor = 0;
-    personas.push_back(combustion);
-
-    HostPersona commotion;
-    commotion.name = "commotion";
-    commotion.description = "Commotion";
-    commotion.executablePath = "C:\\Program Files\\Commotion 4\\Commotion.exe";
-    commotion.commandLine = "\"" + commotion.executablePath + "\"";
-    commotion.apiMajor = 13;
-    commotion.apiMinor = 0;
-    personas.push_back(commotion);
-
-    // A host the module does not know: nothing in its names matches a rule.
-    HostPersona other;
-    other.name = "unknown";
-    other.description = "unidentified host";
-    other.executablePath = "C:\\Tools\\GenHost\\genhost.exe";
-    other.commandLine = "\"" + other.executablePath + "\" -batch";
-    other.apiMajor = 13;
-    other.apiMinor = 0;
-    personas.push_back(other);
+    for (const PersonaRow& row : kPersonas) {
+        HostPersona persona;
+        persona.name = row.name;
+        persona.description = row.description;
+        persona.executablePath = row.executablePath;
+        persona.commandLine = "\"" + persona.executablePath + "\"" + row.arguments;
+        persona.apiMajor = row.apiMajor;
+        persona.apiMinor = row.apiMinor;
+        persona.applId = row.applId;
+        persona.memorySuite = row.memorySuite;
+        persona.worldSuite2 = row.worldSuite2;
+        persona.pixelFormatSuite = row.pixelFormatSuite;
+        persona.appSuite = row.appSuite;
+        for (int i = 0; i < 3; ++i) {
+            persona.background[i] = row.background;
+            persona.text[i] = row.text;
+        }
+        personas.push_back(persona);
+    }
     return personas;
 }
 
