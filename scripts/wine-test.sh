@@ -59,6 +59,7 @@ for program in "${programs[@]}"; do
   status=$?
   ok=$(sed -n 's/^\[  PASSED  \] \([0-9]*\) test.*/\1/p' "$log" | tail -1)
   bad=$(sed -n 's/^\[  FAILED  \] \([0-9]*\) test.*/\1/p' "$log" | tail -1)
+  skipped=$(sed -n 's/^\[  SKIPPED \] \([0-9]*\) test.*/\1/p' "$log" | tail -1)
   ok=${ok:-0}
   bad=${bad:-0}
   if [ "$status" -ne 0 ] && [ "$bad" -eq 0 ]; then
@@ -66,7 +67,7 @@ for program in "${programs[@]}"; do
   fi
   passed=$((passed + ok))
   failed=$((failed + bad))
-  printf '%-28s %4d passed, %d failed\n' "$name" "$ok" "$bad"
+  printf '%-28s %4d passed, %d failed%s\n' "$name" "$ok" "$bad" "${skipped:+, $skipped skipped}"
   if [ "$bad" -ne 0 ]; then
     echo "---- $log (exit status $status)"
     tail -n 60 "$log"
