@@ -355,6 +355,16 @@ void FBTrimBlockCache() {
     for (uint32_t i = 0; i < count; ++i) FreeBlock(blocks[i].store);
 }
 
+namespace {
+
+// The cached blocks go back to the system when the module is unloaded (or the process ends), so
+// that a host unloading the effect keeps no memory of it.
+struct CacheReleaser {
+    ~CacheReleaser() { FBTrimBlockCache(); }
+} g_cacheReleaser;
+
+}  // namespace
+
 // A source that is not format 203 cannot be exported (its planes are not R, G, B floats), and a
 // destination store too small for the export is not written: both leave the destination as it was.
 void FBCopyFrameBuffer(const FrameBuffer* source, FrameBuffer* destination) {
