@@ -69,8 +69,6 @@ void BM_SmartRender8(benchmark::State& state) {
         session.instance->SmartRender(input, output);
         benchmark::ClobberMemory();
     }
-    state.counters["ms_per_frame"] = benchmark::Counter(1e-3, benchmark::Counter::kIsIterationInvariantRate |
-                                                                  benchmark::Counter::kInvert);
     state.counters["ns_per_pixel"] = benchmark::Counter(static_cast<double>(width) * height,
                                                         benchmark::Counter::kIsIterationInvariantRate |
                                                             benchmark::Counter::kInvert);
