@@ -1,6 +1,7 @@
 // The parameters as the host receives them, and the sync between sliders and the settings record.
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cstring>
 #include <string>
 #include <vector>
@@ -134,6 +135,49 @@ TEST(Params, SlidersCarryTheirRangesDefaultsAndFlags) {
     EXPECT_EQ(effect.host().heap().Size(instance.param(5).u.arb_d.dephault), 16432u);
     EXPECT_EQ(instance.param(52).flags, 0);                                   // "RGB" group start
     EXPECT_EQ(instance.param(53).flags, PF_ParamFlag_COLLAPSE_TWIRLY);        // its Master group start
+}
+
+// What holds for every one of the 123 declarations.
+TEST(Params, EveryDeclarationIsWellFormed) {
+    test::Effect effect("aftereffects");
+    const refhost::Host& host = effect.host();
+    std::vector<bool> seen(124, false);
+    int depth = 0;
+    for (size_t index = 1; index < host.paramDefs().size(); ++index) {
+        const PF_ParamDef& def = host.paramDefs()[index];
+        const uint32_t id = host.paramIds()[index];
+        ASSERT_GE(id, 1u);
+        ASSERT_LE(id, 123u);
+        EXPECT_FALSE(seen[id]) << "id " << id << " declared twice";
+        seen[id] = true;
+        EXPECT_LT(std::strlen(def.name), 32u);
+        EXPECT_EQ(def.ui_flags != 0, id == 1 || id == 45 || id == 104 || id == 118) << id;
+        switch (def.param_type) {
+            case PF_Param_GROUP_START: ++depth; break;
+            case PF_Param_GROUP_END: EXPECT_GT(depth--, 0) << "group end without a start at " << index; break;
+            case PF_Param_FLOAT_SLIDER: {
+                const PF_FloatSliderDef& f = def.u.fs_d;
+                EXPECT_LE(f.valid_min, f.slider_min) << id;
+                EXPECT_LE(f.slider_min, f.dephault) << id;
+                EXPECT_LE(f.dephault, f.slider_max) << id;
+                EXPECT_LE(f.slider_max, f.valid_max) << id;
+                EXPECT_EQ(f.value, static_cast<double>(f.dephault)) << id;
+                EXPECT_EQ(f.curve_tolerance, 0.05f) << id;
+                EXPECT_TRUE(f.precision == 2 || f.precision == 3) << id;
+                EXPECT_EQ(f.phase, 0.0) << id;
+                EXPECT_EQ(f.value_desc[0], '\0') << id;
+                EXPECT_TRUE(def.flags & PF_ParamFlag_SUPERVISE) << id;
+                break;
+            }
+            case PF_Param_CHECKBOX: EXPECT_STREQ(def.u.bd.u.nameptr, "") << id; break;
+            case PF_Param_POPUP: EXPECT_EQ(def.u.pd.num_choices, 3) << id; break;
+            case PF_Param_ARBITRARY_DATA: EXPECT_EQ(def.u.arb_d.id, static_cast<A_short>(id)); break;
+            case PF_Param_NO_DATA: EXPECT_EQ(id, 118u); break;
+            default: ADD_FAILURE() << "unexpected type " << def.param_type << " at " << index;
+        }
+    }
+    EXPECT_EQ(depth, 0);
+    EXPECT_EQ(std::count(seen.begin() + 1, seen.end(), true), 123);
 }
 
 TEST(Params, HostDependentDeclarations) {
