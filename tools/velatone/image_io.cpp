@@ -40,29 +40,29 @@ bool ReadImage(const std::string& path, Image* image, std::string* error) {
         *error = "cannot read " + path + ": " + OIIO::geterror();
         return false;
     }
-    const OIIO::ImageSpec& spec = input->spec();
-    if (spec.width <= 0 || spec.height <= 0 || spec.nchannels <= 0) {
+    const OIIO::ImageSpec& header = input->header();
+    if (header.width <= 0 || header.height <= 0 || header.nchannels <= 0) {
         *error = path + " holds no pixels";
         return false;
     }
-    image->width = spec.width;
-    image->height = spec.height;
-    image->channels = std::min(spec.nchannels, 4);
-    image->depth = DepthOf(spec.format);
-    image->format = spec.format.c_str();
-    std::vector<float> pixels(static_cast<size_t>(spec.width) * static_cast<size_t>(spec.height) *
-                              static_cast<size_t>(spec.nchannels));
-    if (!input->read_image(0, 0, 0, spec.nchannels, OIIO::TypeDesc::FLOAT, pixels.data())) {
+    image->width = header.width;
+    image->height = header.height;
+    image->channels = std::min(header.nchannels, 4);
+    image->depth = DepthOf(header.format);
+    image->format = header.format.c_str();
+    std::vector<float> pixels(static_cast<size_t>(header.width) * static_cast<size_t>(header.height) *
+                              static_cast<size_t>(header.nchannels));
+    if (!input->read_image(0, 0, 0, header.nchannels, OIIO::TypeDesc::FLOAT, pixels.data())) {
         *error = "cannot read " + path + ": " + input->geterror();
         return false;
     }
-    const size_t count = static_cast<size_t>(spec.width) * static_cast<size_t>(spec.height);
+    const size_t count = static_cast<size_t>(header.width) * static_cast<size_t>(header.height);
     image->rgba.assign(count * 4, 1.0f);
-    const int alphaChannel = spec.alpha_channel >= 0 ? spec.alpha_channel : (spec.nchannels == 2 || spec.nchannels >= 4 ? spec.nchannels - 1 : -1);
+    const int alphaChannel = header.alpha_channel >= 0 ? header.alpha_channel : (header.nchannels == 2 || header.nchannels >= 4 ? header.nchannels - 1 : -1);
     for (size_t i = 0; i < count; ++i) {
-        const float* p = pixels.data() + i * static_cast<size_t>(spec.nchannels);
+        const float* p = pixels.data() + i * static_cast<size_t>(header.nchannels);
         float* out = image->rgba.data() + i * 4;
-        if (spec.nchannels < 3) {
+        if (header.nchannels < 3) {
             out[0] = out[1] = out[2] = p[0];
         } else {
             out[0] = p[0], out[1] = p[1], out[2] = p[2];
@@ -80,10 +80,10 @@ bool WriteImage(const std::string& path, const Image& image, std::string* error)
     }
     const int channels = image.channels == 1 ? 1 : image.channels == 2 ? 2 : image.channels == 3 ? 3 : 4;
     OIIO::TypeDesc type = image.format.empty() ? OIIO::TypeDesc::UINT8 : OIIO::TypeDesc(image.format);
-    OIIO::ImageSpec spec(image.width, image.height, channels, type);
+    OIIO::ImageSpec header(image.width, image.height, channels, type);
     if (channels == 2 || channels == 4) {
-        spec.alpha_channel = channels - 1;
-        spec.attribute("oiio:UnassociatedAlpha", 1);
+        header.alpha_channel = channels - 1;
+        header.attribute("oiio:UnassociatedAlpha", 1);
     }
     const size_t count = static_cast<size_t>(image.width) * static_cast<size_t>(image.height);
     std::vector<float> pixels(count * static_cast<size_t>(channels));
@@ -100,7 +100,7 @@ bool WriteImage(const std::string& path, const Image& image, std::string* error)
     // Written next to the destination and moved over it once complete, so a failure never leaves
     // a half-written file under the requested name.
     const std::string partial = path + ".partial" + std::filesystem::path(path).extension().string();
-    if (!output->open(partial, spec) || !output->write_image(OIIO::TypeDesc::FLOAT, pixels.data()) ||
+    if (!output->open(partial, header) || !output->write_image(OIIO::TypeDesc::FLOAT, pixels.data()) ||
         !output->close()) {
         *error = "cannot write " + path + ": " + output->geterror();
         std::remove(partial.c_str());
