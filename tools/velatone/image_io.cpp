@@ -40,7 +40,7 @@ bool ReadImage(const std::string& path, Image* image, std::string* error) {
         *error = "cannot read " + path + ": " + OIIO::geterror();
         return false;
     }
-    const OIIO::ImageSpec& header = input->header();
+    const OIIO::ImageSpec& header = input->spec();
     if (header.width <= 0 || header.height <= 0 || header.nchannels <= 0) {
         *error = path + " holds no pixels";
         return false;
