@@ -32,3 +32,11 @@ RegistryResult QueryRegistryValue(RegistryKey* key, const char* name, void* buff
                                   uint32_t* size, RegistryType* type);
 
 }  // namespace vt
+
+namespace vt {
+
+// Where the registry this build reads lives, for people: the registry-export file's path on POSIX
+// (empty when no path can be formed), "the Windows registry" on Windows.
+void DescribeRegistryLocation(char* buffer, size_t capacity);
+
+}  // namespace vt

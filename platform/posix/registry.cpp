@@ -70,6 +70,11 @@ bool SameNameIgnoringCase(const std::string& a, const char* b) {
 
 }  // namespace
 
+void DescribeRegistryLocation(char* buffer, size_t capacity) {
+    if (capacity == 0) return;
+    std::snprintf(buffer, capacity, "%s", RegistryFilePath().c_str());
+}
+
 RegistryKey* OpenRegistryKey(RegistryRoot root, const char* path, uint32_t /*access*/) { return FindKey(root, path); }
 
 RegistryKey* CreateRegistryKey(RegistryRoot root, const char* path) {

@@ -2,6 +2,8 @@
 // module creates when missing is its preferences key, which it still only reads.
 #include "platform/registry.h"
 
+#include <cstdio>
+
 #include <windows.h>
 
 #include <cstring>
@@ -74,6 +76,11 @@ RegistryResult QueryRegistryValue(RegistryKey* key, const char* name, void* buff
     if (size) *size = valueSize;
     if (type) *type = static_cast<RegistryType>(valueType);
     return RegistryResult::kOk;
+}
+
+void DescribeRegistryLocation(char* buffer, size_t capacity) {
+    if (capacity == 0) return;
+    std::snprintf(buffer, capacity, "%s", "the Windows registry");
 }
 
 }  // namespace vt

@@ -11,6 +11,7 @@
 #include <vector>
 
 #include "files/preferences.h"
+#include "platform/registry.h"
 #include "refhost/host.h"
 #include "refhost/property_list.h"
 #include "sdk/ae_effect.h"
@@ -80,13 +81,10 @@ std::string PixelFormatName(int32_t format) {
     return "'" + letters + "' " + Hex(static_cast<uint32_t>(format));
 }
 
-std::string RegistryFileShown() {
-    if (const char* path = std::getenv("VELATONE_REGISTRY"); path && *path) return path;
-    if (const char* config = std::getenv("XDG_CONFIG_HOME"); config && *config) {
-        return std::string(config) + "/velatone/registry.reg";
-    }
-    if (const char* home = std::getenv("HOME"); home && *home) return std::string(home) + "/.config/velatone/registry.reg";
-    return "(none)";
+std::string RegistryShown() {
+    char location[1024] = {};
+    vt::DescribeRegistryLocation(location, sizeof location);
+    return location[0] ? location : "(none)";
 }
 
 void PrintPropertyList(const refhost::Host& host) {
@@ -135,7 +133,7 @@ bool RunHost(const std::string& modulePath, refhost::HostPersona persona) {
 void PrintPreferences() {
     vt::Preferences prefs;
     vt::ReadPreferences(&prefs);
-    std::printf("\npreferences (registry file %s):\n", RegistryFileShown().c_str());
+    std::printf("\npreferences (from %s):\n", RegistryShown().c_str());
     std::printf("  Limiter Default %d, Video System \"%s\" (code %d), video levels %d/%d min %d max %d (range %d), "
                 "black setup %d\n",
                 prefs.limiterDefault, prefs.videoSystemText, prefs.videoSystem, prefs.videoBlackLevel,

@@ -15,6 +15,7 @@
 #include "engine/correction_settings.h"
 #include "host/global_state.h"
 #include "host/sequence_state.h"
+#include "platform/registry.h"
 #include "refhost/effect_instance.h"
 #include "refhost/module_file.h"
 #include "refhost/world.h"
@@ -40,15 +41,9 @@ bool HostCanHandOver(const refhost::HostPersona& persona, refhost::WorldLayout l
 // registry of this run's own, made of the user's registry and that key.
 void PresentColourSpaceKey() {
     std::string text = "Windows Registry Editor Version 5.00\n";
-    const char* current = std::getenv("VELATONE_REGISTRY");
-    std::string userFile;
-    if (current && *current) {
-        userFile = current;
-    } else if (const char* config = std::getenv("XDG_CONFIG_HOME"); config && *config) {
-        userFile = std::string(config) + "/velatone/registry.reg";
-    } else if (const char* home = std::getenv("HOME"); home && *home) {
-        userFile = std::string(home) + "/.config/velatone/registry.reg";
-    }
+    char location[1024] = {};
+    vt::DescribeRegistryLocation(location, sizeof location);
+    const std::string userFile = location;
     if (!userFile.empty()) {
         std::ifstream in(userFile, std::ios::binary);
         if (in) text = std::string((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
