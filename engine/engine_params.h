@@ -75,6 +75,11 @@ struct StageFlags {
     uint8_t setMaster[kChannelSetCount];
     uint8_t setMasterGamma[kChannelSetCount];
     uint8_t toneCurves;
+    // Where the per-channel chain of the Master ranges and the tone curves starts reading a table,
+    // from which on it is composed into one table per colour: 0 nowhere (gains and pedestals only),
+    // 1 the RGB Master gamma, 2 the second Master gamma, 3 the tone curve.
+    uint8_t channelTail;
+    uint8_t channelTailComposed;  // the tail reads more than one table: channelTail[] holds it composed
     uint8_t hueCurves;
     uint8_t lumaRanges;
     uint8_t secondaries;       // any secondary record
@@ -144,6 +149,16 @@ struct EngineParams {
     const float* hueLuma;
     ExtrapolatedTable levels[kColourCount];
     ExtrapolatedTable secondaryGamma[6];
+
+    // Tables the kernel reads three at one level, packed four floats per level (Highlights,
+    // Midtones, Shadows, then a fourth value) so one load per pixel serves all three.
+    const float* weightsPacked;                                   // the weights, then their sum
+    const float* tonalPacked;                                     // the range tonal tables
+    const float* setGammaPacked[kChannelSetCount][kColourCount];  // the range gamma tables
+    const float* huePacked;                                       // the hue curves: shift, saturation, luma
+    // The chain from the first table of channelTail on, evaluated at every level: exact for
+    // levels up to 1 (the chain's first read truncates them to the same entry).
+    const float* channelTail[kColourCount];
 };
 
 }  // namespace vt

@@ -9,6 +9,11 @@
 // Where a formula divides by a pixel's luma or by a limit (highlight compression, soft and hard clip,
 // the composite limits) the division happens only where the divisor is non-zero; elsewhere the
 // pixel passes unchanged. Every table index comes from a value clamped to [0, 1] with NaN sent to 0.
+//
+// Table reads dominate the cost, so the rebuild prepares fewer of them: tables read three at one
+// level come packed side by side (one load per pixel), and the per-channel chain of the Master
+// ranges and the tone curves comes composed into one table per colour. Both give exactly what the
+// separate reads give.
 #pragma once
 
 #include "engine/engine_params.h"
@@ -69,14 +74,18 @@ inline F LookupExtrapolated(const ExtrapolatedTable& t, F v) {
     return Select(v > Splat(1.0f), v * Splat(t.slope) + Splat(t.base), inside);
 }
 
-// Σ W_r L_r(v) over Highlights, Midtones and Shadows, for tables read at the same level.
-inline F WeightedLookup(const ExtrapolatedTable* tables, const Weights& w, F v) {
-    const I index = IndexOf(v);
-    const F inside = w.w[1] * Gather(tables[1].table, index) + w.w[2] * Gather(tables[2].table, index) +
-                     w.w[3] * Gather(tables[3].table, index);
-    const F slope = w.w[1] * Splat(tables[1].slope) + w.w[2] * Splat(tables[2].slope) + w.w[3] * Splat(tables[3].slope);
-    const F base = w.w[1] * Splat(tables[1].base) + w.w[2] * Splat(tables[2].base) + w.w[3] * Splat(tables[3].base);
-    return Select(v > Splat(1.0f), v * slope + base, inside);
+// Σ W_r L_r(v) over Highlights, Midtones and Shadows, for tables read at the same level: packed
+// holds their entries side by side, hi, mid and sh their end values and slopes.
+inline F WeightedLookup(const float* packed, const ExtrapolatedTable& hi, const ExtrapolatedTable& mid,
+                        const ExtrapolatedTable& sh, const Weights& w, F v) {
+    const Quad t = GatherPacked(packed, IndexOf(v));
+    const F inside = w.w[1] * t.v[0] + w.w[2] * t.v[1] + w.w[3] * t.v[2];
+    // Lanes above 1 are rare in most footage: the extrapolation is worked out only when one is there.
+    const M above = v > Splat(1.0f);
+    if (!Any(above)) return inside;
+    const F slope = w.w[1] * Splat(hi.slope) + w.w[2] * Splat(mid.slope) + w.w[3] * Splat(sh.slope);
+    const F base = w.w[1] * Splat(hi.base) + w.w[2] * Splat(mid.base) + w.w[3] * Splat(sh.base);
+    return Select(above, v * slope + base, inside);
 }
 
 inline F WeightedSum(const Weights& w, const float* values) {
@@ -106,14 +115,8 @@ inline Pixel LoadPixel(const KernelPlanes& planes, size_t i) {
 }
 
 inline Weights RangeWeights(const EngineParams& p, const Pixel& px) {
-    const I index = IndexOf(Luma(px));
-    Weights w;
-    w.w[0] = Splat(0.0f);
-    w.w[1] = Gather(p.weightHighlights, index);
-    w.w[2] = Gather(p.weightMidtones, index);
-    w.w[3] = Gather(p.weightShadows, index);
-    w.sum = w.w[1] + w.w[2] + w.w[3];
-    return w;
+    const Quad t = GatherPacked(p.weightsPacked, IndexOf(Luma(px)));
+    return {{Splat(0.0f), t.v[0], t.v[1], t.v[2]}, t.v[3]};
 }
 
 inline void ApplyAutoCompression(const EngineParams& p, Pixel& px) {
@@ -162,8 +165,9 @@ inline void ApplyTonalRanges(const EngineParams& p, const Weights* w, Pixel* px,
     }
     if (f.tonalCurve) {
         for (int g = 0; g < n; ++g) {
-            px[g] = {WeightedLookup(p.tonal, w[g], px[g].r), WeightedLookup(p.tonal, w[g], px[g].g),
-                     WeightedLookup(p.tonal, w[g], px[g].b)};
+            px[g] = {WeightedLookup(p.tonalPacked, p.tonal[1], p.tonal[2], p.tonal[3], w[g], px[g].r),
+                     WeightedLookup(p.tonalPacked, p.tonal[1], p.tonal[2], p.tonal[3], w[g], px[g].g),
+                     WeightedLookup(p.tonalPacked, p.tonal[1], p.tonal[2], p.tonal[3], w[g], px[g].b)};
         }
     }
     if (f.tonalSaturation) {
@@ -238,16 +242,11 @@ inline F SetRangesChannel(const EngineParams& p, int set, int c, const Weights& 
                        w.w[3] * Splat(p.setPedestal[set][3][c]);
     v = v * gain + pedestal;
     if (!p.flags.setRangesGamma[set]) return v;
-    const ExtrapolatedTable tables[4] = {{}, p.setGamma[set][1][c], p.setGamma[set][2][c], p.setGamma[set][3][c]};
-    return WeightedLookup(tables, w, v);
+    return WeightedLookup(p.setGammaPacked[set][c], p.setGamma[set][1][c], p.setGamma[set][2][c], p.setGamma[set][3][c],
+                          w, v);
 }
 
-inline F SetMasterChannel(const EngineParams& p, int set, int c, F v) {
-    v = v * Splat(p.setGain[set][0][c]) + Splat(p.setPedestal[set][0][c]);
-    return p.flags.setMasterGamma[set] ? LookupExtrapolated(p.setGamma[set][0][c], v) : v;
-}
-
-inline void ApplyChannelSets(const EngineParams& p, const Weights* w, Pixel* px, int n) {
+inline void ApplyChannelSetRanges(const EngineParams& p, const Weights* w, Pixel* px, int n) {
     for (int set = 0; set < kChannelSetCount; ++set) {
         if (!p.flags.setRanges[set]) continue;
         for (int g = 0; g < n; ++g) {
@@ -255,18 +254,55 @@ inline void ApplyChannelSets(const EngineParams& p, const Weights* w, Pixel* px,
                      SetRangesChannel(p, set, 2, w[g], px[g].b)};
         }
     }
-    for (int set = 0; set < kChannelSetCount; ++set) {
-        if (!p.flags.setMaster[set]) continue;
-        for (int g = 0; g < n; ++g) {
-            px[g] = {SetMasterChannel(p, set, 0, px[g].r), SetMasterChannel(p, set, 1, px[g].g),
-                     SetMasterChannel(p, set, 2, px[g].b)};
-        }
-    }
 }
 
-inline void ApplyToneCurves(const EngineParams& p, Pixel& px) {
-    px = {LookupExtrapolated(p.toneCurve[0], px.r), LookupExtrapolated(p.toneCurve[1], px.g),
-          LookupExtrapolated(p.toneCurve[2], px.b)};
+inline F SetMasterAffine(const EngineParams& p, int set, int c, F v) {
+    return v * Splat(p.setGain[set][0][c]) + Splat(p.setPedestal[set][0][c]);
+}
+
+// The per-channel chain after the range sets: RGB Master gain, pedestal and gamma, the same of the
+// second set, the tone curve. Runs from step `from` (channelTail's numbering) on, step by step.
+inline F ChannelTailSteps(const EngineParams& p, int c, F v, int from) {
+    const StageFlags& f = p.flags;
+    if (from <= 1 && f.setMasterGamma[kSetRgb]) v = LookupExtrapolated(p.setGamma[kSetRgb][0][c], v);
+    if (from <= 2) {
+        if (from == 1 && f.setMaster[kSetSecond]) v = SetMasterAffine(p, kSetSecond, c, v);
+        if (f.setMasterGamma[kSetSecond]) v = LookupExtrapolated(p.setGamma[kSetSecond][0][c], v);
+    }
+    if (f.toneCurves) v = LookupExtrapolated(p.toneCurve[c], v);
+    return v;
+}
+
+// The composed table serves every level up to 1; lanes above 1 take the chain step by step.
+inline F ChannelTailLookup(const EngineParams& p, int c, F v) {
+    const F inside = Gather(p.channelTail[c], IndexOf(v));
+    const M above = v > Splat(1.0f);
+    if (!Any(above)) return inside;
+    return Select(above, ChannelTailSteps(p, c, v, p.flags.channelTail), inside);
+}
+
+inline void ApplyChannelTail(const EngineParams& p, Pixel* px, int n) {
+    const StageFlags& f = p.flags;
+    // Gains and pedestals ahead of the first table.
+    for (int set = 0; set < kChannelSetCount; ++set) {
+        if (!f.setMaster[set] || (set == kSetSecond && f.channelTail == 1)) continue;
+        for (int g = 0; g < n; ++g) {
+            px[g] = {SetMasterAffine(p, set, 0, px[g].r), SetMasterAffine(p, set, 1, px[g].g),
+                     SetMasterAffine(p, set, 2, px[g].b)};
+        }
+    }
+    if (f.channelTailComposed) {
+        for (int g = 0; g < n; ++g) {
+            px[g] = {ChannelTailLookup(p, 0, px[g].r), ChannelTailLookup(p, 1, px[g].g),
+                     ChannelTailLookup(p, 2, px[g].b)};
+        }
+    } else if (f.channelTail != 0) {
+        const int from = f.channelTail;
+        for (int g = 0; g < n; ++g) {
+            px[g] = {ChannelTailSteps(p, 0, px[g].r, from), ChannelTailSteps(p, 1, px[g].g, from),
+                     ChannelTailSteps(p, 2, px[g].b, from)};
+        }
+    }
 }
 
 // One channel of HSL to RGB: t wraps once into [0, 1], then the piecewise hue function.
@@ -297,10 +333,10 @@ inline void ApplyHueCurves(const EngineParams& p, Pixel& px) {
     // The curves are drawn from cyan to cyan: position 0.5 is red.
     F position = hue + Splat(0.5f);
     position = Select(position > Splat(1.0f), position - Splat(1.0f), position);
-    const I index = IndexOf(position);
-    const F h2 = hue + Gather(p.hueShift, index);
-    const F s2 = saturation * Gather(p.hueSaturation, index);
-    const F l2 = lightness * Gather(p.hueLuma, index);
+    const Quad curve = GatherPacked(p.huePacked, IndexOf(position));
+    const F h2 = hue + curve.v[0];
+    const F s2 = saturation * curve.v[1];
+    const F l2 = lightness * curve.v[2];
 
     const F q = Select(l2 < Splat(0.5f), (s2 + Splat(1.0f)) * l2, l2 + s2 - l2 * s2);
     const F pp = Splat(2.0f) * l2 - q;
@@ -433,10 +469,15 @@ inline void ApplyLimiter(const EngineParams& p, Pixel* px, int n) {
     for (int g = 0; g < n; ++g) ApplyCompositeLimit(p, 1, px[g]);
 }
 
+// Writes the corrected pixel and its luma; without kRgb only the luma (R, G and B are already in
+// place).
+template <bool kRgb>
 inline void StorePixel(const KernelPlanes& planes, size_t i, const Pixel& px) {
-    Store(planes.destination[0] + i, px.r);
-    Store(planes.destination[1] + i, px.g);
-    Store(planes.destination[2] + i, px.b);
+    if constexpr (kRgb) {
+        Store(planes.destination[0] + i, px.r);
+        Store(planes.destination[1] + i, px.g);
+        Store(planes.destination[2] + i, px.b);
+    }
     Store(planes.destination[3] + i, Luma(px));
 }
 
@@ -466,11 +507,11 @@ inline void CorrectBlock(const EngineParams& p, Pixel* px, int n) {
     if (f.hueWheels) {
         for (int k = 0; k < n; ++k) ApplyHueWheels(p, w[k], px[k]);
     }
-    if (f.setRanges[kSetRgb] || f.setRanges[kSetSecond] || f.setMaster[kSetRgb] || f.setMaster[kSetSecond]) {
-        ApplyChannelSets(p, w, px, n);
+    if (f.setRanges[kSetRgb] || f.setRanges[kSetSecond]) {
+        ApplyChannelSetRanges(p, w, px, n);
     }
-    if (f.toneCurves) {
-        for (int k = 0; k < n; ++k) ApplyToneCurves(p, px[k]);
+    if (f.setMaster[kSetRgb] || f.setMaster[kSetSecond] || f.channelTail != 0) {
+        ApplyChannelTail(p, px, n);
     }
     if (f.hueCurves) {
         for (int k = 0; k < n; ++k) ApplyHueCurves(p, px[k]);
@@ -486,44 +527,69 @@ inline void CorrectBlock(const EngineParams& p, Pixel* px, int n) {
     }
 }
 
+// One pass over the planes: whole blocks, whole groups, then the last few floats of a plane whose
+// length is not a whole group through a padded group. Without kStages the pixels pass unchanged.
+template <bool kStages, bool kRgb>
+void PassOverPlanes(const EngineParams& p, const KernelPlanes& planes) {
+    constexpr size_t kBlock = static_cast<size_t>(kLanes) * kBlockGroups;
+    const size_t count = planes.count;
+    const size_t fullBlocks = count - count % kBlock;
+    Pixel px[kBlockGroups];
+    for (size_t i = 0; i < fullBlocks; i += kBlock) {
+        for (int k = 0; k < kBlockGroups; ++k) px[k] = LoadPixel(planes, i + static_cast<size_t>(k) * kLanes);
+        if constexpr (kStages) CorrectBlock(p, px, kBlockGroups);
+        for (int k = 0; k < kBlockGroups; ++k) StorePixel<kRgb>(planes, i + static_cast<size_t>(k) * kLanes, px[k]);
+    }
+
+    const size_t full = count - count % kLanes;
+    const int groups = static_cast<int>((full - fullBlocks) / kLanes);
+    const bool partial = full < count;
+    if (groups == 0 && !partial) return;
+    for (int k = 0; k < groups; ++k) px[k] = LoadPixel(planes, fullBlocks + static_cast<size_t>(k) * kLanes);
+    if (partial) {
+        float in[3][kLanes] = {};
+        for (int c = 0; c < 3; ++c) {
+            for (size_t l = 0; full + l < count; ++l) in[c][l] = planes.source[c][full + l];
+        }
+        const KernelPlanes padded{{in[0], in[1], in[2]}, {nullptr, nullptr, nullptr, nullptr}, kLanes};
+        px[groups] = LoadPixel(padded, 0);
+    }
+    if constexpr (kStages) CorrectBlock(p, px, groups + (partial ? 1 : 0));
+    for (int k = 0; k < groups; ++k) StorePixel<kRgb>(planes, fullBlocks + static_cast<size_t>(k) * kLanes, px[k]);
+    if (partial) {
+        float out[4][kLanes];
+        const KernelPlanes padded{{nullptr, nullptr, nullptr}, {out[0], out[1], out[2], out[3]}, kLanes};
+        StorePixel<true>(padded, 0, px[groups]);
+        for (int c = kRgb ? 0 : 3; c < 4; ++c) {
+            for (size_t l = 0; full + l < count; ++l) planes.destination[c][full + l] = out[c][l];
+        }
+    }
+}
+
+inline bool AnyStage(const StageFlags& f) {
+    return f.autoCompress || f.levels || f.tonalRanges || f.tonalMaster || f.hueWheels || f.setRanges[kSetRgb] ||
+           f.setRanges[kSetSecond] || f.setMaster[kSetRgb] || f.setMaster[kSetSecond] || f.channelTail || f.hueCurves ||
+           f.secondaries || f.limiter;
+}
+
 }  // namespace
 
 void CorrectPlanes(const EngineParams& params, const KernelPlanes& planes) {
     // A local copy of the block: nothing the loop stores can alias it, so its values may stay in
     // registers across groups.
     const EngineParams p = params;
-    constexpr size_t kBlock = static_cast<size_t>(kLanes) * kBlockGroups;
-    Pixel px[kBlockGroups];
-    const size_t fullBlocks = planes.count - planes.count % kBlock;
-    for (size_t i = 0; i < fullBlocks; i += kBlock) {
-        for (int k = 0; k < kBlockGroups; ++k) px[k] = LoadPixel(planes, i + static_cast<size_t>(k) * kLanes);
-        CorrectBlock(p, px, kBlockGroups);
-        for (int k = 0; k < kBlockGroups; ++k) StorePixel(planes, i + static_cast<size_t>(k) * kLanes, px[k]);
+    if (AnyStage(p.flags)) {
+        PassOverPlanes<true, true>(p, planes);
+        return;
     }
-
-    // The rest: whole groups, then the last few floats of a plane whose length is not a whole group
-    // through a padded group.
-    const size_t full = planes.count - planes.count % kLanes;
-    const int groups = static_cast<int>((full - fullBlocks) / kLanes);
-    float in[3][kLanes] = {};
-    for (int c = 0; c < 3; ++c) {
-        for (size_t l = 0; full + l < planes.count; ++l) in[c][l] = planes.source[c][full + l];
-    }
-    const KernelPlanes tail{{in[0], in[1], in[2]}, {nullptr, nullptr, nullptr, nullptr}, kLanes};
-    for (int k = 0; k < groups; ++k) px[k] = LoadPixel(planes, fullBlocks + static_cast<size_t>(k) * kLanes);
-    const bool partial = full < planes.count;
-    if (partial) px[groups] = LoadPixel(tail, 0);
-    const int n = groups + (partial ? 1 : 0);
-    if (n == 0) return;
-    CorrectBlock(p, px, n);
-    for (int k = 0; k < groups; ++k) StorePixel(planes, fullBlocks + static_cast<size_t>(k) * kLanes, px[k]);
-    if (partial) {
-        float out[4][kLanes];
-        const KernelPlanes padded{{nullptr, nullptr, nullptr}, {out[0], out[1], out[2], out[3]}, kLanes};
-        StorePixel(padded, 0, px[groups]);
-        for (int c = 0; c < 4; ++c) {
-            for (size_t l = 0; full + l < planes.count; ++l) planes.destination[c][full + l] = out[c][l];
-        }
+    // Nothing changes a pixel: only the luma plane is new, and in place (as the render runs) the
+    // colour planes need not be written again.
+    const bool inPlace = planes.source[0] == planes.destination[0] && planes.source[1] == planes.destination[1] &&
+                         planes.source[2] == planes.destination[2];
+    if (inPlace) {
+        PassOverPlanes<false, false>(p, planes);
+    } else {
+        PassOverPlanes<false, true>(p, planes);
     }
 }
 

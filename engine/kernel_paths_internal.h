@@ -17,6 +17,10 @@ struct KernelPlanes {
 
 namespace kernel_portable {
 void CorrectPlanes(const EngineParams& params, const KernelPlanes& planes);
+// Evaluates the channel tail (see StageFlags::channelTail) at every level into three tables of
+// 16,385 floats, with the kernel's own arithmetic; the lookup rebuild calls it once the tables the
+// tail reads are final.
+void ComposeChannelTails(const EngineParams& params, float* const tables[kColourCount]);
 }  // namespace kernel_portable
 
 namespace kernel_sse2 {

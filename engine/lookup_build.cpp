@@ -1,6 +1,7 @@
 // The lookup rebuild, the only writer of EngineParams and the tables. Every decision that depends
 // on the settings is made here once per change (stage flags, reciprocals, sines and cosines, end
-// values and slopes, the third channel set folded into the RGB set), so the kernel only indexes.
+// values and slopes, the third channel set folded into the RGB set, tables packed and composed for
+// fewer reads per pixel), so the kernel only indexes.
 // The published set is owned here and swapped atomically; the render serialisation (renderLock or
 // entryLock) keeps rebuilds one at a time, the atomic pointer keeps readers on a whole set.
 #include "engine/lookup_build.h"
@@ -12,6 +13,7 @@
 
 #include "engine/curves.h"
 #include "engine/engine_memory.h"
+#include "engine/kernel_paths_internal.h"
 #include "files/preferences.h"
 #include "platform/ui.h"
 
@@ -28,20 +30,31 @@ constexpr float kTinyDifference = 1e-9f;     // stands in for a zero levels diff
 constexpr float kSteepMidpoint = 1e6f;       // exponent of a midpoint at or beyond the white point
 constexpr float kHardKeyInverse = 1e30f;     // 1 / softness^2 for a zero softness: a hard key edge
 
+// The tables packed four floats per level for the kernel (EngineParams), in their order.
+enum PackedTable : int {
+    kPackedWeights = 0,
+    kPackedTonal,
+    kPackedHue,
+    kPackedSetGamma,  // [set][colour]
+    kPackedCount = kPackedSetGamma + kChannelSetCount * kColourCount,
+};
+
 // Every table of a set lives in one block, at these slots of kLookupSize floats.
 enum TableSlot : int {
     kSlotWeightShadows = 0,
     kSlotWeightMidtones,
     kSlotWeightHighlights,
-    kSlotTonal,                                                   // 4, by stored range
-    kSlotSetGamma = kSlotTonal + 4,                               // [set][range][colour]
+    kSlotTonal,                      // 4, by stored range
+    kSlotSetGamma = kSlotTonal + 4,  // [set][range][colour]
     kSlotToneCurve = kSlotSetGamma + kChannelSetCount * 4 * kColourCount,
     kSlotHueShift = kSlotToneCurve + kColourCount,
     kSlotHueSaturation,
     kSlotHueLuma,
-    kSlotLevels,                                                  // by colour
-    kSlotSecondaryGamma = kSlotLevels + kColourCount,             // by record
-    kSlotCount = kSlotSecondaryGamma + kSecondaryCount,
+    kSlotLevels,                                               // by colour
+    kSlotSecondaryGamma = kSlotLevels + kColourCount,          // by record
+    kSlotChannelTail = kSlotSecondaryGamma + kSecondaryCount,  // by colour
+    kSlotPacked = kSlotChannelTail + kColourCount,             // four slots per packed table
+    kSlotCount = kSlotPacked + 4 * kPackedCount,
 };
 
 // The published set. Written by Update (one at a time, under the render serialisation), read by
@@ -158,10 +171,13 @@ public:
         Secondaries();
         Limiter();
         if (m_work.autoCorrectA != 0.0f) m_p.autoKnee = 1.0f - 0.4f * m_work.autoCorrectA;
+        ChannelTail();
+        PackTables();
     }
 
 private:
     float* Slot(int slot) { return m_set->storage.get() + static_cast<size_t>(slot) * kLookupSize; }
+    float* PackedSlot(int packed) { return Slot(kSlotPacked + 4 * packed); }
 
     // The contents a table had in the previous set, for a builder that ran out of memory; without a
     // previous set, fill() writes a neutral table.
@@ -193,9 +209,17 @@ private:
         m_p.hueSaturation = Slot(kSlotHueSaturation);
         m_p.hueLuma = Slot(kSlotHueLuma);
         for (int k = 0; k < kSecondaryCount; ++k) m_p.secondaryGamma[k].table = Slot(kSlotSecondaryGamma + k);
+        for (int c = 0; c < kColourCount; ++c) m_p.channelTail[c] = Slot(kSlotChannelTail + c);
+        m_p.weightsPacked = PackedSlot(kPackedWeights);
+        m_p.tonalPacked = PackedSlot(kPackedTonal);
+        m_p.huePacked = PackedSlot(kPackedHue);
+        for (int s = 0; s < kChannelSetCount; ++s) {
+            for (int c = 0; c < kColourCount; ++c) m_p.setGammaPacked[s][c] = PackedSlot(PackedSetSlot(s, c));
+        }
     }
 
     static int SetSlot(int set, int range, int colour) { return kSlotSetGamma + (set * 4 + range) * kColourCount + colour; }
+    static int PackedSetSlot(int set, int colour) { return kPackedSetGamma + set * kColourCount + colour; }
 
     const ChannelSet& SetOf(int set) const { return set == kSetRgb ? m_work.rgbSet : m_work.secondSet; }
 
@@ -533,6 +557,62 @@ private:
         m_p.softRatio = span != 0.0f ? (m_p.softWhite - m_p.softKnee) / span : 0.0f;
         m_p.limitMethod = w.limitMethod;
         m_p.videoSystem = w.videoSystem;
+    }
+
+    // The Master ranges of both sets and the tone curves act on each channel alone, one after the
+    // other: from their first table on, the chain is a function of that table's entry, so it
+    // composes into one table per colour, built with the kernel's own arithmetic.
+    void ChannelTail() {
+        vt::StageFlags& f = m_p.flags;
+        if (f.setMasterGamma[kSetRgb]) {
+            f.channelTail = 1;
+        } else if (f.setMasterGamma[kSetSecond]) {
+            f.channelTail = 2;
+        } else if (f.toneCurves) {
+            f.channelTail = 3;
+        } else {
+            return;
+        }
+        // A chain of one table and nothing after it is that table already.
+        const int tables = f.setMasterGamma[kSetRgb] + f.setMasterGamma[kSetSecond] + f.toneCurves;
+        const bool gainBetween = f.channelTail == 1 && f.setMaster[kSetSecond];
+        if (tables < 2 && !gainBetween) return;
+        f.channelTailComposed = 1;
+        float* const composed[kColourCount] = {Slot(kSlotChannelTail), Slot(kSlotChannelTail + 1),
+                                               Slot(kSlotChannelTail + 2)};
+        kernel_portable::ComposeChannelTails(m_p, composed);
+    }
+
+    // Three tables read at one level, side by side; the fourth value of an entry is 0.
+    static void Pack(float* packed, const float* a, const float* b, const float* c) {
+        for (int i = 0; i < kLookupSize; ++i) {
+            packed[4 * i] = a[i];
+            packed[4 * i + 1] = b[i];
+            packed[4 * i + 2] = c[i];
+            packed[4 * i + 3] = 0.0f;
+        }
+    }
+
+    // Runs last, once every table it packs is final (kept from the previous set included).
+    void PackTables() {
+        const vt::StageFlags& f = m_p.flags;
+        float* weights = PackedSlot(kPackedWeights);
+        Pack(weights, m_p.weightHighlights, m_p.weightMidtones, m_p.weightShadows);
+        // The weights' sum, added in the kernel's order.
+        for (int i = 0; i < kLookupSize; ++i)
+            weights[4 * i + 3] = weights[4 * i] + weights[4 * i + 1] + weights[4 * i + 2];
+        if (f.tonalCurve) {
+            Pack(PackedSlot(kPackedTonal), m_p.tonal[kRangeHighlights].table, m_p.tonal[kRangeMidtones].table,
+                 m_p.tonal[kRangeShadows].table);
+        }
+        if (f.hueCurves) Pack(PackedSlot(kPackedHue), m_p.hueShift, m_p.hueSaturation, m_p.hueLuma);
+        for (int s = 0; s < kChannelSetCount; ++s) {
+            if (!f.setRangesGamma[s]) continue;
+            for (int c = 0; c < kColourCount; ++c) {
+                Pack(PackedSlot(PackedSetSlot(s, c)), m_p.setGamma[s][kRangeHighlights][c].table,
+                     m_p.setGamma[s][kRangeMidtones][c].table, m_p.setGamma[s][kRangeShadows][c].table);
+            }
+        }
     }
 
     const CorrectionSettings& m_work;

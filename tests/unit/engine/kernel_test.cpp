@@ -105,6 +105,25 @@ TEST(Kernel, ResetRecordReturnsItsInputWithTheLumaPlane) {
         ASSERT_TRUE(SameFloat(0.299f * copy.plane(0)[i] + 0.587f * copy.plane(1)[i] + 0.114f * copy.plane(2)[i],
                               frame.plane(3)[i]));
     }
+
+    // In place on every path (only the luma plane is written then), to the last float of a plane
+    // that is no whole number of groups or blocks.
+    auto set = BuildEngineSet(*s, nullptr);
+    for (KernelPath path : kAllPaths) {
+        if (!KernelPathAvailable(path)) continue;
+        PlanarFrame inPlace(203, 1);
+        test::FillRandom(&inPlace, 11, true);
+        PlanarFrame before(203, 1);
+        std::memcpy(before.plane(0), inPlace.plane(0), before.frame().planeSize * 3);
+        RunKernel(path, &set->params, inPlace.frame(), inPlace.frame());
+        for (size_t i = 0; i < inPlace.floats(); ++i) {
+            for (int c = 0; c < 3; ++c) ASSERT_TRUE(SameFloat(before.plane(c)[i], inPlace.plane(c)[i])) << i;
+            ASSERT_TRUE(
+                SameFloat(0.299f * before.plane(0)[i] + 0.587f * before.plane(1)[i] + 0.114f * before.plane(2)[i],
+                          inPlace.plane(3)[i]))
+                << KernelPathName(path) << " " << i;
+        }
+    }
 }
 
 TEST(Kernel, LevelsMapInputAndOutputRanges) {
@@ -268,6 +287,58 @@ TEST(Kernel, ChannelSetsApplyGainsAndGammas) {
         const Rgb a = Correct1(*s, kAwkwardPixels[i]);
         const Rgb b = Correct1(*reset, kAwkwardPixels[i]);
         EXPECT_TRUE(SameFloat(a.r, b.r) && SameFloat(a.g, b.g) && SameFloat(a.b, b.b)) << i;
+    }
+}
+
+// The Master ranges of both sets and the tone curves, composed into one table per colour at rebuild,
+// give bit for bit what reading their tables in turn gives: above 1, for NaN and infinities, and
+// whichever of them are on.
+TEST(Kernel, ComposedChannelTailEqualsTheTablesReadInTurn) {
+    struct Case {
+        bool rgbGamma, secondGain, secondGamma, tone;
+        int from;
+        bool composed;
+    };
+    const Case cases[] = {
+        {true, false, false, false, 1, false}, {true, true, false, false, 1, true},
+        {true, false, false, true, 1, true},   {false, true, true, true, 2, true},
+        {true, true, true, true, 1, true},     {false, true, false, true, 3, false},
+        {false, false, true, false, 2, false},
+    };
+    for (const Case& k : cases) {
+        auto s = ResetRecord();
+        s->rgbSet.enable = 1;
+        s->rgbSet.range[kRangeMaster].enable = 1;
+        s->rgbSet.range[kRangeMaster].channel[kChannelRed].gain = 1.3f;
+        s->rgbSet.range[kRangeMaster].channel[kChannelBlue].pedestal = -0.05f;
+        if (k.rgbGamma) s->rgbSet.range[kRangeMaster].channel[kChannelMaster].gamma = 1.4f;
+        s->secondSet.enable = k.secondGain || k.secondGamma;
+        s->secondSet.range[kRangeMaster].enable = 1;
+        if (k.secondGain) s->secondSet.range[kRangeMaster].channel[kChannelGreen].gain = 0.7f;
+        if (k.secondGamma) s->secondSet.range[kRangeMaster].channel[kChannelGreen].gamma = 0.8f;
+        if (k.tone) {
+            s->curvesEnable = 1;
+            s->toneCurvesEnable = 1;
+            test::SetPoints(&s->toneCurves[kChannelMaster], {{0.0f, 0.05f}, {0.5f, 0.6f}, {1.0f, 0.9f}});
+            test::SetPoints(&s->toneCurves[kChannelBlue], {{0.0f, 0.0f}, {0.3f, 0.4f}, {1.0f, 1.0f}});
+        }
+        auto set = BuildEngineSet(*s, nullptr);
+        ASSERT_NE(nullptr, set);
+        EXPECT_EQ(k.from, set->params.flags.channelTail);
+        EXPECT_EQ(k.composed, set->params.flags.channelTailComposed != 0);
+        EngineParams inTurn = set->params;
+        inTurn.flags.channelTailComposed = 0;
+
+        PlanarFrame source(67, 5);
+        test::FillRandom(&source, 5, true);  // values above 1, negatives, NaN and infinities
+        for (KernelPath path : kAllPaths) {
+            if (!KernelPathAvailable(path)) continue;
+            PlanarFrame composed(67, 5);
+            RunKernel(path, &set->params, source.frame(), composed.frame());
+            PlanarFrame reference(67, 5);
+            RunKernel(path, &inTurn, source.frame(), reference.frame());
+            ExpectFramesEqual(reference, composed, KernelPathName(path));
+        }
     }
 }
 

@@ -51,6 +51,34 @@ TEST(LookupBuild, ResetRecordGivesIdentityTablesAndNoStages) {
     }
 }
 
+// What the kernel reads packed is the range tables side by side (the weights with their sum).
+TEST(LookupBuild, PackedTablesHoldTheRangeTablesSideBySide) {
+    auto s = ResetRecord();
+    test::EnableEverything(s.get());
+    auto set = Build(*s);
+    const EngineParams& p = set->params;
+    auto expectPacked = [](const float* packed, const float* a, const float* b, const float* c, const char* what) {
+        for (int i = 0; i < kLookupSize; ++i) {
+            ASSERT_EQ(a[i], packed[4 * i]) << what << " " << i;
+            ASSERT_EQ(b[i], packed[4 * i + 1]) << what << " " << i;
+            ASSERT_EQ(c[i], packed[4 * i + 2]) << what << " " << i;
+        }
+    };
+    expectPacked(p.weightsPacked, p.weightHighlights, p.weightMidtones, p.weightShadows, "weights");
+    for (int i = 0; i < kLookupSize; ++i) {
+        ASSERT_EQ(p.weightHighlights[i] + p.weightMidtones[i] + p.weightShadows[i], p.weightsPacked[4 * i + 3]) << i;
+    }
+    expectPacked(p.tonalPacked, p.tonal[kRangeHighlights].table, p.tonal[kRangeMidtones].table,
+                 p.tonal[kRangeShadows].table, "tonal");
+    expectPacked(p.huePacked, p.hueShift, p.hueSaturation, p.hueLuma, "hue");
+    for (int k = 0; k < kChannelSetCount; ++k) {
+        for (int c = 0; c < kColourCount; ++c) {
+            expectPacked(p.setGammaPacked[k][c], p.setGamma[k][kRangeHighlights][c].table,
+                         p.setGamma[k][kRangeMidtones][c].table, p.setGamma[k][kRangeShadows][c].table, "set");
+        }
+    }
+}
+
 TEST(LookupBuild, DisabledGroupsCountAsResetWhileTheRecordKeepsThem) {
     auto s = ResetRecord();
     test::EnableEverything(s.get());
