@@ -151,8 +151,7 @@ struct EngineParams {
     ExtrapolatedTable secondaryGamma[6];
 
     // Tables the kernel reads three at one level, packed four floats per level (Highlights,
-    // Midtones, Shadows, then a fourth value) so one load per pixel serves all three.
-    const float* weightsPacked;                                   // the weights, then their sum
+    // Midtones, Shadows, then 0) so one load per pixel serves all three.
     const float* tonalPacked;                                     // the range tonal tables
     const float* setGammaPacked[kChannelSetCount][kColourCount];  // the range gamma tables
     const float* huePacked;                                       // the hue curves: shift, saturation, luma

@@ -114,9 +114,17 @@ inline Pixel LoadPixel(const KernelPlanes& planes, size_t i) {
     return {Load(planes.source[0] + i), Load(planes.source[1] + i), Load(planes.source[2] + i)};
 }
 
+// Three gathers rather than one packed read: every later stage waits for the weights, and a packed
+// read (indices through memory, loads, a transpose) takes longer to arrive (measured).
 inline Weights RangeWeights(const EngineParams& p, const Pixel& px) {
-    const Quad t = GatherPacked(p.weightsPacked, IndexOf(Luma(px)));
-    return {{Splat(0.0f), t.v[0], t.v[1], t.v[2]}, t.v[3]};
+    const I index = IndexOf(Luma(px));
+    Weights w;
+    w.w[0] = Splat(0.0f);
+    w.w[1] = Gather(p.weightHighlights, index);
+    w.w[2] = Gather(p.weightMidtones, index);
+    w.w[3] = Gather(p.weightShadows, index);
+    w.sum = w.w[1] + w.w[2] + w.w[3];
+    return w;
 }
 
 inline void ApplyAutoCompression(const EngineParams& p, Pixel& px) {

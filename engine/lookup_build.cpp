@@ -32,8 +32,7 @@ constexpr float kHardKeyInverse = 1e30f;     // 1 / softness^2 for a zero softne
 
 // The tables packed four floats per level for the kernel (EngineParams), in their order.
 enum PackedTable : int {
-    kPackedWeights = 0,
-    kPackedTonal,
+    kPackedTonal = 0,
     kPackedHue,
     kPackedSetGamma,  // [set][colour]
     kPackedCount = kPackedSetGamma + kChannelSetCount * kColourCount,
@@ -210,7 +209,6 @@ private:
         m_p.hueLuma = Slot(kSlotHueLuma);
         for (int k = 0; k < kSecondaryCount; ++k) m_p.secondaryGamma[k].table = Slot(kSlotSecondaryGamma + k);
         for (int c = 0; c < kColourCount; ++c) m_p.channelTail[c] = Slot(kSlotChannelTail + c);
-        m_p.weightsPacked = PackedSlot(kPackedWeights);
         m_p.tonalPacked = PackedSlot(kPackedTonal);
         m_p.huePacked = PackedSlot(kPackedHue);
         for (int s = 0; s < kChannelSetCount; ++s) {
@@ -596,11 +594,6 @@ private:
     // Runs last, once every table it packs is final (kept from the previous set included).
     void PackTables() {
         const vt::StageFlags& f = m_p.flags;
-        float* weights = PackedSlot(kPackedWeights);
-        Pack(weights, m_p.weightHighlights, m_p.weightMidtones, m_p.weightShadows);
-        // The weights' sum, added in the kernel's order.
-        for (int i = 0; i < kLookupSize; ++i)
-            weights[4 * i + 3] = weights[4 * i] + weights[4 * i + 1] + weights[4 * i + 2];
         if (f.tonalCurve) {
             Pack(PackedSlot(kPackedTonal), m_p.tonal[kRangeHighlights].table, m_p.tonal[kRangeMidtones].table,
                  m_p.tonal[kRangeShadows].table);

@@ -51,7 +51,7 @@ TEST(LookupBuild, ResetRecordGivesIdentityTablesAndNoStages) {
     }
 }
 
-// What the kernel reads packed is the range tables side by side (the weights with their sum).
+// What the kernel reads packed is the range tables side by side.
 TEST(LookupBuild, PackedTablesHoldTheRangeTablesSideBySide) {
     auto s = ResetRecord();
     test::EnableEverything(s.get());
@@ -64,10 +64,6 @@ TEST(LookupBuild, PackedTablesHoldTheRangeTablesSideBySide) {
             ASSERT_EQ(c[i], packed[4 * i + 2]) << what << " " << i;
         }
     };
-    expectPacked(p.weightsPacked, p.weightHighlights, p.weightMidtones, p.weightShadows, "weights");
-    for (int i = 0; i < kLookupSize; ++i) {
-        ASSERT_EQ(p.weightHighlights[i] + p.weightMidtones[i] + p.weightShadows[i], p.weightsPacked[4 * i + 3]) << i;
-    }
     expectPacked(p.tonalPacked, p.tonal[kRangeHighlights].table, p.tonal[kRangeMidtones].table,
                  p.tonal[kRangeShadows].table, "tonal");
     expectPacked(p.huePacked, p.hueShift, p.hueSaturation, p.hueLuma, "hue");
