@@ -2,7 +2,7 @@
 // reference host from its command line, the tests from a script). No hook: every dialog is cancelled.
 #include "platform/dialogs.h"
 
-#include "platform/posix/hooks_internal.h"
+#include "platform/hooks_internal.h"
 #include "platform/ui.h"
 
 namespace vt {
@@ -22,7 +22,7 @@ void AddDefaultExtension(const char* extension, std::string* path) {
 }  // namespace
 
 bool ShowFileDialog(const FileDialogRequest& request, std::string* path, int* filterIndex) {
-    const posix::InstalledHooks installed = posix::CurrentHooks();
+    const InstalledHooks installed = CurrentHooks();
     if (installed.hooks.fileDialog == nullptr || path == nullptr) return false;
     const std::string filter = FilterText(request);
     const char* answer = installed.hooks.fileDialog(installed.hooks.context, request.save ? 1 : 0, filter.c_str(),

@@ -9,7 +9,7 @@
 #include <cstdlib>
 #include <cstring>
 
-#include "platform/posix/hooks_internal.h"
+#include "platform/hooks_internal.h"
 
 namespace vt {
 
@@ -25,7 +25,7 @@ void CopyTerminated(char* buffer, size_t capacity, const char* text, size_t leng
 }  // namespace
 
 void GetProcessCommandLine(char* buffer, size_t capacity) {
-    const posix::InstalledHooks installed = posix::CurrentHooks();
+    const InstalledHooks installed = CurrentHooks();
     if (installed.haveCommandLine) {
         CopyTerminated(buffer, capacity, installed.commandLine.data(), installed.commandLine.size());
         return;
@@ -45,7 +45,7 @@ void GetProcessCommandLine(char* buffer, size_t capacity) {
 }
 
 void GetProcessExecutablePath(char* buffer, size_t capacity) {
-    const posix::InstalledHooks installed = posix::CurrentHooks();
+    const InstalledHooks installed = CurrentHooks();
     if (installed.haveExecutablePath) {
         CopyTerminated(buffer, capacity, installed.executablePath.data(), installed.executablePath.size());
         return;

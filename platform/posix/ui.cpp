@@ -5,7 +5,7 @@
 #include <cstdio>
 #include <cstdlib>
 
-#include "platform/posix/hooks_internal.h"
+#include "platform/hooks_internal.h"
 
 namespace vt {
 
@@ -23,7 +23,7 @@ const char* KindLabel(int kind) {
 }  // namespace
 
 void ShowMessage(const char* text, int kind) {
-    const posix::InstalledHooks installed = posix::CurrentHooks();
+    const InstalledHooks installed = CurrentHooks();
     if (installed.hooks.message) {
         installed.hooks.message(installed.hooks.context, text ? text : "", kind);
         return;
@@ -32,7 +32,7 @@ void ShowMessage(const char* text, int kind) {
 }
 
 void DebugOutput(const char* text) {
-    const posix::InstalledHooks installed = posix::CurrentHooks();
+    const InstalledHooks installed = CurrentHooks();
     if (installed.hooks.debug) installed.hooks.debug(installed.hooks.context, text ? text : "");
     if (std::getenv("VELATONE_DEBUG")) std::fputs(text ? text : "", stderr);
 }
@@ -40,7 +40,7 @@ void DebugOutput(const char* text) {
 void* GetForegroundWindowHandle() { return nullptr; }
 
 void ShowAboutDialog(void* owner) {
-    const posix::InstalledHooks installed = posix::CurrentHooks();
+    const InstalledHooks installed = CurrentHooks();
     if (installed.hooks.about) installed.hooks.about(installed.hooks.context, owner);
 }
 

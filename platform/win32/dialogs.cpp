@@ -11,7 +11,7 @@
 #include <new>
 
 #include "platform/ui.h"
-#include "platform/win32/hooks_internal.h"
+#include "platform/hooks_internal.h"
 
 namespace vt {
 
@@ -45,7 +45,7 @@ void AddDefaultExtension(const char* extension, std::string* path) {
     *path += extension;
 }
 
-bool AskHook(const win32::InstalledHooks& installed, const FileDialogRequest& request, std::string* path,
+bool AskHook(const InstalledHooks& installed, const FileDialogRequest& request, std::string* path,
              int* filterIndex) {
     const std::string filter = FilterText(request);
     const char* answer = installed.hooks.fileDialog(installed.hooks.context, request.save ? 1 : 0, filter.c_str(),
@@ -64,7 +64,7 @@ bool AskHook(const win32::InstalledHooks& installed, const FileDialogRequest& re
 
 bool ShowFileDialog(const FileDialogRequest& request, std::string* path, int* filterIndex) {
     if (path == nullptr) return false;
-    const win32::InstalledHooks installed = win32::CurrentHooks();
+    const InstalledHooks installed = CurrentHooks();
     if (installed.hooks.fileDialog) return AskHook(installed, request, path, filterIndex);
 
     std::unique_ptr<char[]> buffer(new (std::nothrow) char[kDialogPathSize]);

@@ -6,7 +6,7 @@
 
 #include <cstring>
 
-#include "platform/win32/hooks_internal.h"
+#include "platform/hooks_internal.h"
 #include "platform/win32/module_internal.h"
 
 namespace vt {
@@ -33,7 +33,7 @@ void ModuleFileName(HMODULE module, char* buffer, size_t capacity) {
 }  // namespace
 
 void GetProcessCommandLine(char* buffer, size_t capacity) {
-    const win32::InstalledHooks installed = win32::CurrentHooks();
+    const InstalledHooks installed = CurrentHooks();
     if (installed.haveCommandLine) {
         CopyTerminated(buffer, capacity, installed.commandLine.data(), installed.commandLine.size());
         return;
@@ -44,7 +44,7 @@ void GetProcessCommandLine(char* buffer, size_t capacity) {
 }
 
 void GetProcessExecutablePath(char* buffer, size_t capacity) {
-    const win32::InstalledHooks installed = win32::CurrentHooks();
+    const InstalledHooks installed = CurrentHooks();
     if (installed.haveExecutablePath) {
         CopyTerminated(buffer, capacity, installed.executablePath.data(), installed.executablePath.size());
         return;

@@ -5,7 +5,7 @@
 
 #include <windows.h>
 
-#include "platform/win32/hooks_internal.h"
+#include "platform/hooks_internal.h"
 
 namespace vt {
 
@@ -25,7 +25,7 @@ UINT IconOf(int kind) {
 }  // namespace
 
 void ShowMessage(const char* text, int kind) {
-    const win32::InstalledHooks installed = win32::CurrentHooks();
+    const InstalledHooks installed = CurrentHooks();
     if (installed.hooks.message) {
         installed.hooks.message(installed.hooks.context, text ? text : "", kind);
         return;
@@ -35,7 +35,7 @@ void ShowMessage(const char* text, int kind) {
 }
 
 void DebugOutput(const char* text) {
-    const win32::InstalledHooks installed = win32::CurrentHooks();
+    const InstalledHooks installed = CurrentHooks();
     if (installed.hooks.debug) installed.hooks.debug(installed.hooks.context, text ? text : "");
     OutputDebugStringA(text ? text : "");
 }
@@ -44,7 +44,7 @@ void* GetForegroundWindowHandle() { return GetForegroundWindow(); }
 
 // The about box itself is drawn by its own subsystem; until then a host's sink may stand in for it.
 void ShowAboutDialog(void* owner) {
-    const win32::InstalledHooks installed = win32::CurrentHooks();
+    const InstalledHooks installed = CurrentHooks();
     if (installed.hooks.about) installed.hooks.about(installed.hooks.context, owner);
 }
 

@@ -1,32 +1,28 @@
 // Storage of the hosting process's hooks and the exported function that installs them. A real host
 // never installs any; the reference host and the tests do, so that messages are recorded instead of
 // shown and a host identity can be presented.
-#include "platform/win32/hooks_internal.h"
+#include "platform/hooks_internal.h"
 
-#include <windows.h>
+#include <mutex>
 
-namespace vt::win32 {
+#include "sdk/ae_config.h"
+
+namespace vt {
 
 namespace {
-
-// A slim reader/writer lock needs no initialisation call, so it is usable before any setup runs.
-SRWLOCK g_hooksLock = SRWLOCK_INIT;  // guards g_hooks
+std::mutex g_hooksMutex;  // guards g_hooks; constant-initialised, so usable before any setup runs
 InstalledHooks g_hooks;
-
 }  // namespace
 
 InstalledHooks CurrentHooks() {
-    AcquireSRWLockShared(&g_hooksLock);
-    InstalledHooks copy = g_hooks;
-    ReleaseSRWLockShared(&g_hooksLock);
-    return copy;
+    std::lock_guard<std::mutex> guard(g_hooksMutex);
+    return g_hooks;
 }
 
-}  // namespace vt::win32
+}  // namespace vt
 
-extern "C" __declspec(dllexport) void VelatoneInstallPlatformHooks(const VtPlatformHooks* hooks) {
-    using namespace vt::win32;
-    InstalledHooks installed;
+extern "C" DllExport void VelatoneInstallPlatformHooks(const VtPlatformHooks* hooks) {
+    vt::InstalledHooks installed;
     if (hooks && hooks->size >= sizeof(VtPlatformHooks)) {
         installed.hooks = *hooks;
         installed.haveCommandLine = hooks->commandLine != nullptr;
@@ -37,7 +33,6 @@ extern "C" __declspec(dllexport) void VelatoneInstallPlatformHooks(const VtPlatf
         installed.hooks.commandLine = nullptr;
         installed.hooks.executablePath = nullptr;
     }
-    AcquireSRWLockExclusive(&g_hooksLock);
-    g_hooks = std::move(installed);
-    ReleaseSRWLockExclusive(&g_hooksLock);
+    std::lock_guard<std::mutex> guard(vt::g_hooksMutex);
+    vt::g_hooks = std::move(installed);
 }

@@ -1,11 +1,11 @@
-// The hooks installed by the hosting process, as the POSIX backend keeps them.
+// The hooks installed by the hosting process, as both backends keep them.
 #pragma once
 
 #include <string>
 
 #include "platform/host_hooks.h"
 
-namespace vt::posix {
+namespace vt {
 
 struct InstalledHooks {
     VtPlatformHooks hooks{};
@@ -18,4 +18,4 @@ struct InstalledHooks {
 // The current hooks; a copy, so that a concurrent install never tears a read.
 InstalledHooks CurrentHooks();
 
-}  // namespace vt::posix
+}  // namespace vt
